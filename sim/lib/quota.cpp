@@ -1,0 +1,64 @@
+// The quota library of the simulated device. Not built yet: each call is only an
+// event, limits read back as 0 (no limit).
+#include "platform/quota.h"
+
+#include <string>
+
+#include "journal.h"
+
+extern "C" int LIB_Quota(int kind, const char* device_dir, const char* name,
+                         unsigned long long* limit, unsigned long long* used)
+{
+    journal_record("LIB_Quota", {std::to_string(kind), device_dir, name});
+    *limit = 0;
+    *used = 0;
+    return 0;
+}
+
+extern "C" int LIB_Set_User_Quota(const char* device_dir, const char* user, long long limit_kb)
+{
+    journal_record("LIB_Set_User_Quota", {device_dir, user, std::to_string(limit_kb)});
+    return 0;
+}
+
+extern "C" int LIB_Set_Group_Quota(const char* device_dir, const char* group, long long limit_kb)
+{
+    journal_record("LIB_Set_Group_Quota", {device_dir, group, std::to_string(limit_kb)});
+    return 0;
+}
+
+extern "C" unsigned long long Lib_Get_Max_User_Quota(const char* device_dir, const char* user)
+{
+    journal_record("Lib_Get_Max_User_Quota", {device_dir, user});
+    return 0;
+}
+
+extern "C" unsigned long long Lib_Gen_Get_Max_User_Quota(const char* device_dir, const char* user)
+{
+    journal_record("Lib_Gen_Get_Max_User_Quota", {device_dir, user});
+    return 0;
+}
+
+extern "C" unsigned long long Lib_Get_Min_Group_Quota(const char* device_dir, const char* group)
+{
+    journal_record("Lib_Get_Min_Group_Quota", {device_dir, group});
+    return 0;
+}
+
+extern "C" unsigned long long LIB_Get_Add_New_Group_Min_Quota(const char* device_dir, const char* members)
+{
+    journal_record("LIB_Get_Add_New_Group_Min_Quota", {device_dir, members});
+    return 0;
+}
+
+extern "C" int LIB_Compare_User_and_Group_Quota(const char* user, const char* group)
+{
+    journal_record("LIB_Compare_User_and_Group_Quota", {user, group});
+    return 0;
+}
+
+extern "C" int LIB_Rejoin_Other_Group_Quota(void)
+{
+    journal_record("LIB_Rejoin_Other_Group_Quota", {});
+    return 0;
+}

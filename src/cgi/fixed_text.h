@@ -1,0 +1,45 @@
+// Fixed-size, zero-filled text buffers. The device's pages depend on how long each
+// value may be: a form value is cut to size-1 bytes, a config value likewise. The
+// size is part of the behaviour, so it is spelled out at every use.
+#pragma once
+
+#include <array>
+#include <cstddef>
+#include <cstring>
+#include <string_view>
+
+template <std::size_t N>
+class FixedText {
+    static_assert(N > 0);
+
+public:
+    static constexpr std::size_t capacity = N;
+
+    FixedText() { m_bytes.fill('\0'); }
+    explicit FixedText(std::string_view text) : FixedText() { assign(text); }
+
+    char* data() { return m_bytes.data(); }
+    const char* c_str() const { return m_bytes.data(); }
+    // Size as the C libraries take it.
+    static constexpr int size() { return static_cast<int>(N); }
+
+    // Bounded by the buffer even when a caller fills every byte without a terminator.
+    std::size_t length() const { return strnlen(m_bytes.data(), N); }
+    std::string_view view() const { return {m_bytes.data(), length()}; }
+    bool empty() const { return m_bytes[0] == '\0'; }
+
+    void clear() { m_bytes.fill('\0'); }
+    // Copies at most N-1 bytes and terminates, like the device's bounded copies.
+    void assign(std::string_view text)
+    {
+        clear();
+        std::memcpy(m_bytes.data(), text.data(), std::min(text.size(), N - 1));
+    }
+
+    bool operator==(std::string_view other) const { return view() == other; }
+    char& operator[](std::size_t i) { return m_bytes.at(i); }
+    char operator[](std::size_t i) const { return m_bytes.at(i); }
+
+private:
+    std::array<char, N> m_bytes;
+};

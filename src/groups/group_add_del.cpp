@@ -1,0 +1,5 @@
+// Not built yet: until then these commands answer nothing, like unknown ones.
+#include "cgi/handlers.h"
+
+void cgi_group_add() {}
+void cgi_group_del() {}

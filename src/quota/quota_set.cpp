@@ -1,0 +1,5 @@
+// Not built yet: until then these commands answer nothing, like unknown ones.
+#include "cgi/handlers.h"
+
+void cgi_user_set_quota() {}
+void cgi_group_set_quota() {}

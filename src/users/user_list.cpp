@@ -1,0 +1,5 @@
+// Not built yet: until then these commands answer nothing, like unknown ones.
+#include "cgi/handlers.h"
+
+void cgi_get_user_list() {}
+void cgi_get_user_info() {}

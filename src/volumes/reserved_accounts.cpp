@@ -1,0 +1,63 @@
+#include "volumes/reserved_accounts.h"
+
+#include <array>
+#include <grp.h>
+#include <pwd.h>
+#include <string_view>
+
+#include "cgi/file.h"
+
+namespace {
+
+// Exact, case-sensitive names: "Admin" is an ordinary user.
+constexpr std::array<std::string_view, 8> kReservedUsers{
+    "root", "nobody", "ftp", "admin", "sshd", "squeezecenter", "messagebus", "netdev"};
+constexpr std::array<std::string_view, 5> kReservedGroups{
+    "root", "allaccount", "administrators", "share", "netdev"};
+
+template <std::size_t N>
+bool is_listed_in(const std::array<std::string_view, N>& names, const char* name)
+{
+    for (std::string_view reserved : names) {
+        if (reserved == name)
+            return true;
+    }
+    return false;
+}
+
+} // namespace
+
+bool is_reserved_user(const char* name)
+{
+    return is_listed_in(kReservedUsers, name);
+}
+
+bool is_reserved_group(const char* name)
+{
+    return is_listed_in(kReservedGroups, name);
+}
+
+int count_listed_users()
+{
+    int count = 0;
+    const UniqueFile users = open_file("/etc/passwd", "r");
+    if (users) {
+        while (const passwd* entry = fgetpwent(users.get())) {
+            if (!is_reserved_user(entry->pw_name))
+                ++count;
+        }
+    }
+    endpwent();
+    return count;
+}
+
+int count_listed_groups()
+{
+    int count = 0;
+    while (const group* entry = getgrent()) {
+        if (!is_reserved_group(entry->gr_name))
+            ++count;
+    }
+    endgrent();
+    return count;
+}
