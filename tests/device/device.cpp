@@ -1,0 +1,358 @@
+#include "device.h"
+
+#include <cctype>
+#include <cstdio>
+#include <cstdlib>
+#include <fcntl.h>
+#include <filesystem>
+#include <fstream>
+#include <pugixml.hpp>
+#include <spawn.h>
+#include <sstream>
+#include <stdexcept>
+#include <sys/wait.h>
+#include <unistd.h>
+
+extern char** environ;
+
+namespace fs = std::filesystem;
+
+namespace {
+
+const std::string kRepo = NAS_SOURCE_DIR;
+const std::string kBuild = NAS_BUILD_DIR;
+const std::string kProgram = "/var/www/cgi-bin/nas-accounts.cgi";
+
+std::string slurp(const std::string& path)
+{
+    std::ifstream in(path, std::ios::binary);
+    std::ostringstream content;
+    content << in.rdbuf();
+    return content.str();
+}
+
+// Runs argv on the host with the given environment; standard input from a file,
+// standard output and error into files (no pipe can fill up and block).
+Reply spawn(const std::vector<std::string>& argv, const std::vector<std::string>& environment,
+            std::string_view input, const std::string& scratch)
+{
+    const std::string in_path = scratch + "/stdin", out_path = scratch + "/stdout", err_path = scratch + "/stderr";
+    std::ofstream(in_path, std::ios::binary) << input;
+
+    posix_spawn_file_actions_t actions;
+    posix_spawn_file_actions_init(&actions);
+    posix_spawn_file_actions_addopen(&actions, 0, in_path.c_str(), O_RDONLY, 0);
+    posix_spawn_file_actions_addopen(&actions, 1, out_path.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
+    posix_spawn_file_actions_addopen(&actions, 2, err_path.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
+
+    std::vector<char*> args;
+    for (const std::string& arg : argv)
+        args.push_back(const_cast<char*>(arg.c_str()));
+    args.push_back(nullptr);
+    std::vector<char*> env;
+    for (const std::string& entry : environment)
+        env.push_back(const_cast<char*>(entry.c_str()));
+    env.push_back(nullptr);
+
+    pid_t pid = 0;
+    const int failed = posix_spawnp(&pid, args[0], &actions, nullptr, args.data(), env.data());
+    posix_spawn_file_actions_destroy(&actions);
+    if (failed)
+        throw std::runtime_error("cannot start " + argv[0]);
+    int status = 0;
+    waitpid(pid, &status, 0);
+
+    Reply reply;
+    reply.out = slurp(out_path);
+    reply.err = slurp(err_path);
+    reply.status = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
+    fs::remove(in_path);
+    fs::remove(out_path);
+    fs::remove(err_path);
+    return reply;
+}
+
+std::string devroot()
+{
+    return kRepo + "/scripts/devroot";
+}
+
+std::vector<std::string> base_environment()
+{
+    std::vector<std::string> env;
+    for (const char* name : {"PATH", "HOME", "ASAN_OPTIONS", "UBSAN_OPTIONS", "TMPDIR"}) {
+        if (const char* value = std::getenv(name))
+            env.push_back(std::string(name) + "=" + value);
+    }
+    env.push_back("NAS_BUILD=" + kBuild);
+    return env;
+}
+
+std::string query_string(std::string_view cmd, const Fields& fields)
+{
+    std::string query = "cmd=" + url_encode(cmd);
+    for (const auto& [name, value] : fields)
+        query += "&" + url_encode(name) + "=" + url_encode(value);
+    return query;
+}
+
+Event split_event(const std::string& line)
+{
+    Event event;
+    std::string field;
+    for (std::size_t i = 0; i < line.size(); ++i) {
+        const char c = line[i];
+        if (c == '\t') {
+            event.push_back(field);
+            field.clear();
+        } else if (c == '\\' && i + 1 < line.size()) {
+            const char next = line[++i];
+            field += next == 't' ? '\t' : next == 'n' ? '\n' : next;
+        } else {
+            field += c;
+        }
+    }
+    event.push_back(field);
+    return event;
+}
+
+pugi::xml_node config_key(pugi::xml_document& doc, std::string_view key, bool create)
+{
+    pugi::xml_node node = doc.document_element();
+    std::string_view rest = key;
+    while (!rest.empty() && node) {
+        if (rest.front() == '/') {
+            rest.remove_prefix(1);
+            continue;
+        }
+        const auto slash = rest.find('/');
+        const std::string name(rest.substr(0, slash));
+        pugi::xml_node child = node.child(name.c_str());
+        if (!child && create)
+            child = node.append_child(name.c_str());
+        node = child;
+        rest = slash == std::string_view::npos ? std::string_view{} : rest.substr(slash);
+    }
+    return node;
+}
+
+} // namespace
+
+Device::Device()
+{
+    const fs::path base = fs::temp_directory_path() / "nas-devices";
+    fs::create_directories(base);
+    std::string pattern = (base / "deviceXXXXXX").string();
+    if (!mkdtemp(pattern.data()))
+        throw std::runtime_error("cannot make a device directory");
+    m_root = pattern;
+    m_scratch = m_root + ".io";
+    fs::create_directories(m_scratch);
+    const Reply created = spawn({devroot(), "create", m_root}, base_environment(), "", m_scratch);
+    if (created.status != 0)
+        throw std::runtime_error("devroot create failed: " + created.err);
+}
+
+Device::~Device()
+{
+    if (!std::getenv("NAS_KEEP_DEVICES")) {
+        std::error_code ignored;
+        fs::remove_all(m_root, ignored);
+        fs::remove_all(m_scratch, ignored);
+    }
+}
+
+std::string Device::host_path(std::string_view device_path) const
+{
+    return m_root + std::string(device_path);
+}
+
+void Device::write_file(std::string_view device_path, std::string_view content)
+{
+    const fs::path path = host_path(device_path);
+    fs::create_directories(path.parent_path());
+    std::ofstream(path, std::ios::binary | std::ios::trunc) << content;
+}
+
+std::string Device::read_file(std::string_view device_path) const
+{
+    return slurp(host_path(device_path));
+}
+
+bool Device::exists(std::string_view device_path) const
+{
+    std::error_code ignored;
+    return fs::exists(fs::symlink_status(host_path(device_path), ignored));
+}
+
+void Device::remove(std::string_view device_path)
+{
+    std::error_code ignored;
+    fs::remove_all(host_path(device_path), ignored);
+}
+
+void Device::symlink(std::string_view target, std::string_view device_path)
+{
+    remove(device_path);
+    fs::create_symlink(std::string(target), host_path(device_path));
+}
+
+void Device::config(std::initializer_list<std::pair<std::string, std::string>> keys)
+{
+    const std::string file = host_path("/etc/NAS_CFG/config.xml");
+    pugi::xml_document doc;
+    doc.load_file(file.c_str());
+    for (const auto& [key, value] : keys)
+        config_key(doc, key, true).text().set(value.c_str());
+    doc.save_file(file.c_str(), "\t");
+}
+
+void Device::remove_config(std::string_view key)
+{
+    const std::string file = host_path("/etc/NAS_CFG/config.xml");
+    pugi::xml_document doc;
+    doc.load_file(file.c_str());
+    if (pugi::xml_node node = config_key(doc, key, false))
+        node.parent().remove_child(node);
+    doc.save_file(file.c_str(), "\t");
+}
+
+std::string Device::config_value(std::string_view key) const
+{
+    const std::string file = host_path("/etc/NAS_CFG/config.xml");
+    pugi::xml_document doc;
+    doc.load_file(file.c_str());
+    const pugi::xml_node node = config_key(doc, key, false);
+    return node ? node.child_value() : "(missing)";
+}
+
+void Device::install_probe(std::string_view name)
+{
+    const std::string target = host_path("/sbin/" + std::string(name));
+    fs::copy_file(kBuild + "/" + std::string(name), target, fs::copy_options::overwrite_existing);
+}
+
+void Device::trace_on()
+{
+    write_file("/tmp/cgi_debug", "");
+}
+
+std::string Device::request(std::string_view cmd, const Fields& fields)
+{
+    return get_raw(query_string(cmd, fields)).out;
+}
+
+std::string Device::post(std::string_view cmd, const Fields& fields)
+{
+    return post_raw(query_string(cmd, fields), "application/x-www-form-urlencoded").out;
+}
+
+Reply Device::get_raw(std::string_view query)
+{
+    return run({kProgram}, {{"REQUEST_METHOD", "GET"}, {"QUERY_STRING", std::string(query)}});
+}
+
+Reply Device::post_raw(std::string_view body, std::string_view content_type, std::string_view query)
+{
+    return run({kProgram},
+               {{"REQUEST_METHOD", "POST"},
+                {"QUERY_STRING", std::string(query)},
+                {"CONTENT_TYPE", std::string(content_type)},
+                {"CONTENT_LENGTH", std::to_string(body.size())}},
+               body);
+}
+
+Reply Device::run(const std::vector<std::string>& argv, const Fields& environment, std::string_view input)
+{
+    std::vector<std::string> command{devroot(), "run", m_root, "--"};
+    command.insert(command.end(), argv.begin(), argv.end());
+    std::vector<std::string> env = base_environment();
+    env.push_back("GATEWAY_INTERFACE=CGI/1.1");
+    env.push_back("SCRIPT_NAME=/cgi-bin/nas-accounts.cgi");
+    for (const auto& [name, value] : environment)
+        env.push_back(name + "=" + value);
+    return spawn(command, env, input, m_scratch);
+}
+
+Journal Device::journal() const
+{
+    Journal events;
+    std::istringstream lines(read_file("/var/log/platform.log"));
+    std::string line;
+    while (std::getline(lines, line))
+        events.push_back(split_event(line));
+    return events;
+}
+
+std::vector<std::string> Device::messages() const
+{
+    std::vector<std::string> result;
+    std::istringstream lines(read_file("/var/log/messages"));
+    std::string line;
+    while (std::getline(lines, line))
+        result.push_back(line);
+    return result;
+}
+
+std::string Device::console() const
+{
+    return read_file("/var/log/console");
+}
+
+void Device::clear_records()
+{
+    write_file("/var/log/platform.log", "");
+    write_file("/var/log/messages", "");
+    write_file("/var/log/console", "");
+}
+
+std::string url_encode(std::string_view value)
+{
+    constexpr std::string_view kHex = "0123456789ABCDEF";
+    std::string encoded;
+    for (const unsigned char c : value) {
+        if (std::isalnum(c) || c == '-' || c == '_' || c == '.' || c == '~') {
+            encoded += static_cast<char>(c);
+        } else {
+            encoded += '%';
+            encoded += kHex[c >> 4];
+            encoded += kHex[c & 15];
+        }
+    }
+    return encoded;
+}
+
+std::string xml_answer(std::string_view body)
+{
+    return "Pragma: no-cache\r\nCache-Control: no-cache\r\nContent-Type: text/xml\r\n\r\n"
+           "<?xml version=\"1.0\" encoding=\"UTF-8\"?>" + std::string(body);
+}
+
+std::string xml_utf8_answer(std::string_view body)
+{
+    return "Pragma: no-cache\r\nCache-Control: no-cache\r\nContent-Type: text/xml; charset=utf-8\r\n\r\n"
+           "<?xml version=\"1.0\" encoding=\"UTF-8\"?>" + std::string(body);
+}
+
+Journal without(const Journal& journal, std::initializer_list<std::string_view> names)
+{
+    Journal kept;
+    for (const Event& event : journal) {
+        bool drop = false;
+        for (std::string_view name : names)
+            drop = drop || event.at(0) == name;
+        if (!drop)
+            kept.push_back(event);
+    }
+    return kept;
+}
+
+std::vector<std::string> shell_lines(const Journal& journal)
+{
+    std::vector<std::string> lines;
+    for (const Event& event : journal) {
+        if (event.size() == 3 && event[0] == "sh" && event[1] == "-c")
+            lines.push_back(event[2]);
+    }
+    return lines;
+}
