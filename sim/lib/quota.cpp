@@ -27,30 +27,6 @@ extern "C" int LIB_Set_Group_Quota(const char* device_dir, const char* group, lo
     return 0;
 }
 
-extern "C" unsigned long long Lib_Get_Max_User_Quota(const char* device_dir, const char* user)
-{
-    journal_record("Lib_Get_Max_User_Quota", {device_dir, user});
-    return 0;
-}
-
-extern "C" unsigned long long Lib_Gen_Get_Max_User_Quota(const char* device_dir, const char* user)
-{
-    journal_record("Lib_Gen_Get_Max_User_Quota", {device_dir, user});
-    return 0;
-}
-
-extern "C" unsigned long long Lib_Get_Min_Group_Quota(const char* device_dir, const char* group)
-{
-    journal_record("Lib_Get_Min_Group_Quota", {device_dir, group});
-    return 0;
-}
-
-extern "C" unsigned long long LIB_Get_Add_New_Group_Min_Quota(const char* device_dir, const char* members)
-{
-    journal_record("LIB_Get_Add_New_Group_Min_Quota", {device_dir, members});
-    return 0;
-}
-
 extern "C" int LIB_Compare_User_and_Group_Quota(const char* user, const char* group)
 {
     journal_record("LIB_Compare_User_and_Group_Quota", {user, group});

@@ -24,9 +24,11 @@ int tool_quota_set(int argc, char** argv);
 int tool_gpasswd(int argc, char** argv);
 int tool_usermod(int argc, char** argv);
 int tool_chfn(int argc, char** argv);
-// domain.cpp
+// wbinfo.cpp
 int tool_wbinfo(int argc, char** argv);
+// net.cpp
 int tool_net(int argc, char** argv);
+
 // acl.cpp
 int tool_getfacl(int argc, char** argv);
 int tool_setfacl(int argc, char** argv);

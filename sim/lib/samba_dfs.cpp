@@ -1,23 +1,11 @@
-// The Samba interface library of the simulated device. Not built yet: each call is
-// only an event, and the lists stay empty.
+// DFS links and groups of the simulated device. Not built yet: each call is only an
+// event, and the lists stay empty.
 #include "platform/samba.h"
 
 #include "journal.h"
 
-struct share_info* pss = nullptr;
 struct dfs_info* pdfs = nullptr;
 struct name_list* pnl = nullptr;
-
-extern "C" int get_samba_info2(void)
-{
-    journal_record("get_samba_info2", {});
-    return 0;
-}
-
-extern "C" void Free_All_List(void)
-{
-    journal_record("Free_All_List", {});
-}
 
 extern "C" int create_dfs_link(void)
 {
@@ -83,17 +71,5 @@ extern "C" int get_dfs_group_info(void)
 extern "C" int get_host_share_name(const char* host)
 {
     journal_record("get_host_share_name", {host});
-    return 0;
-}
-
-extern "C" int ads_start(void)
-{
-    journal_record("ads_start", {});
-    return 0;
-}
-
-extern "C" int ads_stop(void)
-{
-    journal_record("ads_stop", {});
     return 0;
 }

@@ -1,0 +1,37 @@
+# The two commands of the README, and a few more.
+#   make demo    the simulated device with the program behind a real web server
+#   make test    build and pass every test (also under ASan+UBSan with SANITIZE=1)
+#   make bench   the benchmark ratios
+BUILD ?= build
+ASAN_BUILD ?= build-asan
+JOBS ?= 2
+PORT ?= 8080
+DEMO ?= demo-device
+
+.PHONY: all setup build test test-asan bench demo clean
+
+all: build
+
+setup:
+	@scripts/setup-machine
+
+build: setup
+	@cmake -S . -B $(BUILD) -DCMAKE_BUILD_TYPE=RelWithDebInfo >/dev/null
+	@cmake --build $(BUILD) -j$(JOBS)
+
+test: build
+	@cd $(BUILD) && ctest -j$(JOBS) --output-on-failure
+
+test-asan: setup
+	@cmake -S . -B $(ASAN_BUILD) -DCMAKE_BUILD_TYPE=Debug -DNAS_SANITIZE=ON >/dev/null
+	@cmake --build $(ASAN_BUILD) -j$(JOBS)
+	@cd $(ASAN_BUILD) && ctest -j$(JOBS) --output-on-failure
+
+bench: build
+	@NAS_BUILD=$(abspath $(BUILD)) bench/run
+
+demo: build
+	@scripts/demo $(DEMO) $(PORT)
+
+clean:
+	rm -rf $(BUILD) $(ASAN_BUILD)

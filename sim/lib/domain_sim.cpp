@@ -1,0 +1,37 @@
+#include "domain_sim.h"
+
+#include <cstdlib>
+
+#include "text_file.h"
+
+std::optional<SimulatedDomain> load_simulated_domain()
+{
+    const std::vector<std::string> lines = read_lines(kDomainFile);
+    if (lines.empty())
+        return std::nullopt;
+    SimulatedDomain domain;
+    for (const std::string& line : lines) {
+        if (line.empty() || line[0] == '#')
+            continue;
+        const auto equals = line.find('=');
+        if (equals == std::string::npos)
+            continue;
+        const std::string key = line.substr(0, equals);
+        const std::string value = line.substr(equals + 1);
+        if (key == "realm")
+            domain.realm = value;
+        else if (key == "workgroup")
+            domain.workgroup = value;
+        else if (key == "controller")
+            domain.controller = value;
+        else if (key == "dns")
+            domain.dns = value;
+        else if (key == "join_result")
+            domain.join_result = std::atoi(value.c_str());
+        else if (key == "trust")
+            domain.trust = value;
+        else if (key == "users" && !value.empty())
+            domain.users = split(value, ',');
+    }
+    return domain;
+}

@@ -1,0 +1,76 @@
+#include "share_store.h"
+
+#include <cstdlib>
+#include <filesystem>
+
+#include "text_file.h"
+
+namespace fs = std::filesystem;
+
+namespace {
+
+std::vector<std::pair<std::string, int>> parse_access(const std::string& text)
+{
+    std::vector<std::pair<std::string, int>> access;
+    if (text.empty())
+        return access;
+    for (const std::string& item : split(text, ',')) {
+        const auto colon = item.rfind(':');
+        if (colon == std::string::npos || colon == 0)
+            continue;
+        access.emplace_back(item.substr(0, colon), std::atoi(item.c_str() + colon + 1));
+    }
+    return access;
+}
+
+std::string format_access(const std::vector<std::pair<std::string, int>>& access)
+{
+    std::vector<std::string> items;
+    for (const auto& [account, level] : access)
+        items.push_back(account + ":" + std::to_string(level));
+    return join(items, ',');
+}
+
+} // namespace
+
+std::vector<ShareEntry> load_shares()
+{
+    std::vector<ShareEntry> shares;
+    for (const std::string& line : read_lines(kShareStorePath)) {
+        const auto f = split(line, '\t');
+        if (f.size() != 9 || f[0].empty())
+            continue;
+        shares.push_back({f[0], f[1], f[2], f[3], std::atoi(f[4].c_str()), std::atoi(f[5].c_str()),
+                          std::atoi(f[6].c_str()), std::atoi(f[7].c_str()), parse_access(f[8])});
+    }
+    return shares;
+}
+
+bool save_shares(const std::vector<ShareEntry>& shares)
+{
+    std::vector<std::string> lines;
+    for (const ShareEntry& s : shares) {
+        lines.push_back(join({s.name, s.path, s.read_only, s.browseable, std::to_string(s.recycle_bin),
+                              std::to_string(s.public_access), std::to_string(s.media_serving),
+                              std::to_string(s.remote_access), format_access(s.access)}, '\t'));
+    }
+    return write_lines(kShareStorePath, lines);
+}
+
+void link_share(const ShareEntry& share)
+{
+    std::error_code ignored;
+    fs::create_directories(share.path, ignored);
+    fs::create_directories("/shares", ignored);
+    const fs::path link = fs::path("/shares") / share.name;
+    fs::remove(link, ignored);
+    fs::create_symlink(share.path, link, ignored);
+}
+
+void unlink_share(std::string_view name)
+{
+    std::error_code ignored;
+    const fs::path link = fs::path("/shares") / std::string(name);
+    if (fs::is_symlink(link, ignored))
+        fs::remove(link, ignored);
+}

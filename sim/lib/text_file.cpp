@@ -1,0 +1,55 @@
+#include "text_file.h"
+
+#include <cstdio>
+#include <fstream>
+#include <unistd.h>
+
+std::vector<std::string> read_lines(const std::string& path)
+{
+    std::vector<std::string> lines;
+    std::ifstream in(path);
+    std::string line;
+    while (std::getline(in, line)) {
+        if (!line.empty() && line.back() == '\r')
+            line.pop_back();
+        lines.push_back(line);
+    }
+    return lines;
+}
+
+bool write_lines(const std::string& path, const std::vector<std::string>& lines)
+{
+    const std::string temporary = path + ".new." + std::to_string(getpid());
+    {
+        std::ofstream out(temporary, std::ios::trunc);
+        for (const std::string& line : lines)
+            out << line << '\n';
+        if (!out)
+            return false;
+    }
+    return std::rename(temporary.c_str(), path.c_str()) == 0;
+}
+
+std::vector<std::string> split(std::string_view text, char separator)
+{
+    std::vector<std::string> fields;
+    std::size_t begin = 0;
+    for (;;) {
+        const auto end = text.find(separator, begin);
+        fields.emplace_back(text.substr(begin, end - begin));
+        if (end == std::string_view::npos)
+            return fields;
+        begin = end + 1;
+    }
+}
+
+std::string join(const std::vector<std::string>& fields, char separator)
+{
+    std::string text;
+    for (std::size_t i = 0; i < fields.size(); ++i) {
+        if (i)
+            text += separator;
+        text += fields[i];
+    }
+    return text;
+}

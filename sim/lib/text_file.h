@@ -1,0 +1,15 @@
+// Whole-file reading and writing for the simulated platform's stores.
+#pragma once
+
+#include <string>
+#include <string_view>
+#include <vector>
+
+// The file's lines without their line ends; empty when the file is missing.
+std::vector<std::string> read_lines(const std::string& path);
+// Replaces the file with these lines, each ending in LF (written to a temporary file
+// beside it, then renamed over it). Returns false when it cannot be written.
+bool write_lines(const std::string& path, const std::vector<std::string>& lines);
+// Splits at every `separator`; "a\t\tb" gives three fields.
+std::vector<std::string> split(std::string_view text, char separator);
+std::string join(const std::vector<std::string>& fields, char separator);
