@@ -21,7 +21,8 @@ int printf_out(const char* format, ...)
     va_end(args);
 
     // A console that cannot be opened makes the write fail silently.
-    const int console = open("/dev/console", O_WRONLY);
+    // Appending: each line follows the previous one also when the console is a file.
+    const int console = open("/dev/console", O_WRONLY | O_APPEND);
     const ssize_t written = write(console, line.data(), std::strlen(line.data()));
     if (console >= 0)
         close(console);
