@@ -38,6 +38,19 @@ void write_quota_answer_header()
     write_xml_prologue();
 }
 
+// The developer trace of the two single-volume queries, under their own heading.
+void trace_single_volume_query(const char* heading, const FixedText<8>& hdd, const FixedText<64>& name,
+                               const VolumePaths& paths, unsigned long long value)
+{
+    printf_out("%s", heading);
+    printf_out("hdd=%s\n", hdd.c_str());
+    printf_out("name=%s\n", name.c_str());
+    printf_out("path1=%s\n", device_dir_of(paths[0]));
+    printf_out("path2=%s\n", device_dir_of(paths[1]));
+    printf_out("maxsize=%lld\n", static_cast<long long>(value));
+    printf_out("---------------------------\n");
+}
+
 } // namespace
 
 // While a user is being added. "name" is what the page has chosen so far: in the
@@ -85,13 +98,7 @@ void cgi_get_user_quota_maxsize()
     }
 
     write_quota_answer_header();
-    printf_out("------get user max quota--------\n");
-    printf_out("hdd=%s\n", hdd.c_str());
-    printf_out("name=%s\n", name.c_str());
-    printf_out("path1=%s\n", device_dir_of(paths[0]));
-    printf_out("path2=%s\n", device_dir_of(paths[1]));
-    printf_out("maxsize=%lld\n", static_cast<long long>(max));
-    printf_out("---------------------------\n");
+    trace_single_volume_query("------get user max quota--------\n", hdd, name, paths, max);
     out("<quota_info>\n");
     out("<max_size>%llu</max_size>\n", max);
     out("</quota_info>\n");
@@ -131,13 +138,7 @@ void cgi_get_group_quota_minsize()
         min = Lib_Get_Min_Group_Quota(device_dir_of(paths[volume - 1]), name.c_str());
 
     write_quota_answer_header();
-    printf_out("------get group min quota--------\n");
-    printf_out("hdd=%s\n", hdd.c_str());
-    printf_out("name=%s\n", name.c_str());
-    printf_out("path1=%s\n", device_dir_of(paths[0]));
-    printf_out("path2=%s\n", device_dir_of(paths[1]));
-    printf_out("maxsize=%lld\n", static_cast<long long>(min));
-    printf_out("---------------------------\n");
+    trace_single_volume_query("------get group min quota--------\n", hdd, name, paths, min);
     // The page reads the minimum under the maximum's element name, on one line; the
     // name and the shape stay as the page expects them.
     out("<quota_info><max_size>%llu</max_size></quota_info>", min);
