@@ -81,10 +81,3 @@ TEST(QuotaBounds, NewGroupMinimumIsOverTheSentMemberList)
     for (const auto& c : cases)
         EXPECT_EQ(min_new_group_quota(parse_member_list(c.members), kLimits, c.dir), c.min) << c.members;
 }
-
-TEST(QuotaBounds, MemberListsSplitAtCommas)
-{
-    EXPECT_EQ(parse_member_list("alice,bob"), (std::vector<std::string>{"alice", "bob"}));
-    EXPECT_EQ(parse_member_list(" alice ,, bob,"), (std::vector<std::string>{"alice", "bob"}));
-    EXPECT_TRUE(parse_member_list("").empty());
-}
