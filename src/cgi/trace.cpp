@@ -20,8 +20,9 @@ int printf_out(const char* format, ...)
     std::vsnprintf(line.data(), line.size(), format, args);
     va_end(args);
 
-    // A console that cannot be opened makes the write fail silently.
-    const int console = open("/dev/console", O_WRONLY);
+    // A console that cannot be opened makes the write fail silently. Appending keeps
+    // the lines of one request when the console is a plain file (the simulated device).
+    const int console = open("/dev/console", O_WRONLY | O_APPEND);
     const ssize_t written = write(console, line.data(), std::strlen(line.data()));
     if (console >= 0)
         close(console);
