@@ -7,10 +7,15 @@
 #include <fcntl.h>
 #include <unistd.h>
 
+bool trace_enabled()
+{
+    return access("/tmp/cgi_debug", F_OK) == 0;
+}
+
 int printf_out(const char* format, ...)
 {
     // The switch file's mere existence turns the trace on; nothing is formatted otherwise.
-    if (access("/tmp/cgi_debug", F_OK) != 0)
+    if (!trace_enabled())
         return 0;
 
     // 2560 bytes: a longer line is cut to 2559 characters.
