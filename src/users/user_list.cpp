@@ -15,6 +15,7 @@
 #include "cgi/trace.h"
 #include "platform/config_store.h"
 #include "platform/share.h"
+#include "users/password_entries.h"
 #include "volumes/helpers.h"
 #include "volumes/reserved_accounts.h"
 #include "volumes/volume_table.h"
@@ -79,18 +80,16 @@ void list_domain_users(const FixedText<4>& page, FilteredPageCounter& counter, c
 
 void list_local_users(const FixedText<4>& page, FilteredPageCounter& counter, const UserFilter& filter)
 {
-    if (const UniqueFile users = open_file("/etc/passwd", "r")) {
-        while (const passwd* entry = fgetpwent(users.get())) {
-            if (is_reserved_user(entry->pw_name))
-                continue;
-            if (const int id = counter.offer(filter.passes(entry->pw_name))) {
-                const std::string name = entry->pw_name;
-                FixedText<55296> groups;
-                LIB_Web_Get_User_Join_Group(name.c_str(), groups.data());
-                write_grid_row(id, {name.c_str(), groups.c_str()});
-            }
+    for_each_password_entry("/etc/passwd", [&](const passwd& entry) {
+        if (is_reserved_user(entry.pw_name))
+            return;
+        if (const int id = counter.offer(filter.passes(entry.pw_name))) {
+            const std::string name = entry.pw_name;
+            FixedText<55296> groups;
+            LIB_Web_Get_User_Join_Group(name.c_str(), groups.data());
+            write_grid_row(id, {name.c_str(), groups.c_str()});
         }
-    }
+    });
     write_grid_end(page.c_str(), counter.total());
 }
 
@@ -129,15 +128,13 @@ void cgi_get_user_info()
 
     int user_count = 0;
     std::string users;
-    if (const UniqueFile passwd_file = open_file("/etc/passwd", "r")) {
-        while (const passwd* entry = fgetpwent(passwd_file.get())) {
-            if (is_reserved_user(entry->pw_name))
-                continue;
-            ++user_count;
-            users += entry->pw_name;
-            users += '#';
-        }
-    }
+    for_each_password_entry("/etc/passwd", [&](const passwd& entry) {
+        if (is_reserved_user(entry.pw_name))
+            return;
+        ++user_count;
+        users += entry.pw_name;
+        users += '#';
+    });
     std::string groups;
     while (const group* entry = getgrent()) {
         if (is_reserved_group(entry->gr_name))
