@@ -13,7 +13,8 @@
 //                                  named in the list, adding the missing ones; any other
 //                                  mode: the list replaces the share's whole access list
 //   free_acnt_list(list)           releases the nodes insert_acnt_node made
-//   del_share(name)                removes the share and its link (never the folder)
+//   del_share(name)                removes the share of exactly that name and its link
+//                                  (never the folder)
 //   delete_user_group_name(name)   removes "name" and "@name" from every access list
 //   change_user_group_name(o, n)   renames "o" to "n" and "@o" to "@n" in every list
 //   LIB_Web_Get_User_Join_Group    the user's groups besides allaccount, comma-separated
@@ -152,18 +153,14 @@ extern "C" void free_acnt_list(struct acnt_list* list)
     }
 }
 
+// Removes the share's line from the share store and its /shares link (the folder stays).
 extern "C" int del_share(const char* name)
 {
     journal_record("del_share", {name});
     std::vector<ShareEntry> shares = load_shares();
-    const ShareEntry* share = find_share(shares, name);
-    if (!share)
-        return -1;
-    const std::string removed = share->name;
-    std::erase_if(shares, [&](const ShareEntry& s) { return s.name == removed; });
-    if (!save_shares(shares))
-        return -1;
-    unlink_share(removed);
+    std::erase_if(shares, [name](const ShareEntry& share) { return share.name == name; });
+    save_shares(shares);
+    unlink_share(name);
     return 0;
 }
 
