@@ -75,3 +75,12 @@ inline std::string resolved(Device& dev, const std::string& path)
         out.pop_back();
     return out;
 }
+
+// Writes the volume table; "(none)" removes it.
+inline void set_volume_table(Device& dev, const std::string& table)
+{
+    if (table == "(none)")
+        dev.remove("/etc/shared_name");
+    else
+        dev.write_file("/etc/shared_name", table);
+}

@@ -127,10 +127,7 @@ TEST(GroupInfo, NamesTheInternalVolumes)
     };
     for (const auto& c : cases) {
         Device dev;
-        if (c.table == "(none)")
-            dev.remove("/etc/shared_name");
-        else
-            dev.write_file("/etc/shared_name", c.table);
+        set_volume_table(dev, c.table);
         EXPECT_EQ(dev.request("cgi_get_group_info"), xml_answer("<group_info>" + c.body + "</group_info>")) << c.what;
     }
 }

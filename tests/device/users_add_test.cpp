@@ -154,10 +154,7 @@ TEST(UserAdd, HomeShareFollowsTheVolumeTable)
     };
     for (const auto& c : cases) {
         Device dev;
-        if (c.table == "(none)")
-            dev.remove("/etc/shared_name");
-        else
-            dev.write_file("/etc/shared_name", c.table);
+        set_volume_table(dev, c.table);
         EXPECT_EQ(dev.request("cgi_user_add", {{"name", c.name}}), kAdded) << c.what;
         Journal expected{{"sh", "-c", "account -a -u '" + c.name + "' -p '' -l '' -f '' -h '' -e ''"},
                          {"account", "-a", "-u", c.name, "-p", "", "-l", "", "-f", "", "-h", "", "-e", ""},

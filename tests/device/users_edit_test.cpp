@@ -28,10 +28,7 @@ TEST(UserEditInfo, ShowsLimitsPerInternalVolume)
     for (const auto& c : cases) {
         Device dev;
         dev.write_file("/var/lib/platform/quota", "u\tHD_a2\talice\t103423\nu\tHD_b2\talice\t1023\n");
-        if (c.table == "(none)")
-            dev.remove("/etc/shared_name");
-        else
-            dev.write_file("/etc/shared_name", c.table);
+        set_volume_table(dev, c.table);
         EXPECT_EQ(dev.request("cgi_get_modify_user_info", {{"name", c.name}}),
                   xml_answer("<user_info>\n" + c.body + "</user_info>"))
             << c.what;

@@ -159,10 +159,7 @@ TEST(UserInfo, GivesTotalsNamesAndVolumes)
     };
     for (const auto& c : cases) {
         Device dev;
-        if (c.table == "(none)")
-            dev.remove("/etc/shared_name");
-        else
-            dev.write_file("/etc/shared_name", c.table);
+        set_volume_table(dev, c.table);
         if (c.passwd != "(default)")
             dev.write_file("/etc/passwd", c.passwd);
         EXPECT_EQ(dev.request("cgi_get_user_info"), xml_utf8_answer(c.body)) << c.what;
