@@ -166,3 +166,12 @@ TEST(UserInfo, GivesTotalsNamesAndVolumes)
         EXPECT_EQ(dev.journal(), c.journal) << c.what;
     }
 }
+
+TEST(UserInfo, TracesItsCounts)
+{
+    Device dev;
+    dev.trace_on();
+    dev.request("cgi_get_user_info");
+    EXPECT_EQ(dev.console(), "------get user info--------\nnum=3\nalluser=alice#bob#carol\nhd_num=2\n"
+                             "hd_size=1877538,937795\n---------------------------\n");
+}
