@@ -1,6 +1,95 @@
-// gpasswd, usermod and chfn. Not built yet: only their journal lines.
+// gpasswd, usermod and chfn: the forms of them the device uses, changing the account
+// files (sim/lib/account_files.h) as the real tools do.
+//
+//   gpasswd -d USER GROUP    removes USER from GROUP's members
+//   usermod -g GROUP USER    makes GROUP (a name or a number) USER's primary group
+//   chfn -o OTHER USER       sets the "other" (fifth) field of USER's GECOS entry
+//
+// Their messages and exit codes are those of the real tools.
+#include <cstdio>
+#include <cstring>
+#include <string>
+#include <vector>
+
+#include "sim/lib/account_files.h"
 #include "tools.h"
 
-int tool_gpasswd(int, char**) { return 0; }
-int tool_usermod(int, char**) { return 0; }
-int tool_chfn(int, char**) { return 0; }
+namespace {
+
+int usage(const char* tool)
+{
+    std::fprintf(stderr, "Usage: %s ...\n", tool);
+    return 2;
+}
+
+} // namespace
+
+int tool_gpasswd(int argc, char** argv)
+{
+    if (argc != 4 || std::strcmp(argv[1], "-d") != 0)
+        return usage("gpasswd");
+    const std::string user = argv[2];
+    const std::string name = argv[3];
+    ColonFile groups = ColonFile::load(kGroupFile);
+    ColonRow* group = groups.find(name);
+    if (!group) {
+        std::fprintf(stderr, "gpasswd: group '%s' does not exist in /etc/group\n", name.c_str());
+        return 3;
+    }
+    std::vector<std::string> members = group_members(*group);
+    if (std::erase(members, user) == 0) {
+        std::fprintf(stderr, "gpasswd: user '%s' is not a member of '%s'\n", user.c_str(), name.c_str());
+        return 3;
+    }
+    std::printf("Removing user %s from group %s\n", user.c_str(), name.c_str());
+    set_group_members(*group, members);
+    return groups.save() ? 0 : 1;
+}
+
+int tool_usermod(int argc, char** argv)
+{
+    if (argc != 4 || std::strcmp(argv[1], "-g") != 0)
+        return usage("usermod");
+    const std::string wanted = argv[2];
+    const std::string user = argv[3];
+    const ColonFile groups = ColonFile::load(kGroupFile);
+    std::string gid;
+    for (const ColonRow& row : groups.rows) {
+        if (row[0] == wanted || field(row, 2) == wanted) {
+            gid = field(row, 2);
+            break;
+        }
+    }
+    if (gid.empty()) {
+        std::fprintf(stderr, "usermod: group '%s' does not exist\n", wanted.c_str());
+        return 6;
+    }
+    ColonFile passwd = ColonFile::load(kPasswdFile);
+    ColonRow* entry = passwd.find(user);
+    if (!entry) {
+        std::fprintf(stderr, "usermod: user '%s' does not exist\n", user.c_str());
+        return 6;
+    }
+    set_field(*entry, 3, gid);
+    return passwd.save() ? 0 : 1;
+}
+
+int tool_chfn(int argc, char** argv)
+{
+    if (argc != 4 || std::strcmp(argv[1], "-o") != 0)
+        return usage("chfn");
+    const std::string other = argv[2];
+    const std::string user = argv[3];
+    if (other.find_first_of(":,=\n") != std::string::npos) {
+        std::fprintf(stderr, "chfn: invalid other: '%s'\n", other.c_str());
+        return 1;
+    }
+    ColonFile passwd = ColonFile::load(kPasswdFile);
+    ColonRow* entry = passwd.find(user);
+    if (!entry) {
+        std::fprintf(stderr, "chfn: user '%s' does not exist\n", user.c_str());
+        return 1;
+    }
+    set_gecos_field(*entry, kGecosOther, other);
+    return passwd.save() ? 0 : 1;
+}

@@ -1,5 +1,58 @@
-// Not built yet: until then these commands answer nothing, like unknown ones.
-#include "cgi/handlers.h"
+// What the new-group and edit-group pages show: the volumes and the group's limits.
+#include <cstdio>
+#include <cstring>
 
-void cgi_get_group_info() {}
-void cgi_get_modify_group_info() {}
+#include "cgi/file.h"
+#include "cgi/fixed_text.h"
+#include "cgi/form.h"
+#include "cgi/handlers.h"
+#include "cgi/response.h"
+#include "platform/quota.h"
+#include "users/account_volumes.h"
+#include "volumes/volume_table.h"
+
+namespace {
+
+void write_volume_count_and_sizes()
+{
+    out("<hddnum>%d</hddnum>", count_volumes());
+    FixedText<256> sizes;
+    list_volume_sizes(sizes);
+    out("<hddsize>%s</hddsize>", sizes.c_str());
+}
+
+} // namespace
+
+// The names of the internal volumes, then their number and sizes.
+void cgi_get_group_info()
+{
+    write_xml_header(Charset::Plain);
+    write_xml_prologue();
+    out("<group_info>");
+    for_each_internal_volume([](const char* volume, const char*) { out("<v_name>%s</v_name>", volume); });
+    write_volume_count_and_sizes();
+    out("</group_info>");
+}
+
+// The volumes' number and sizes first, then the group's limit on each internal
+// volume in megabytes. "type" is sent by the page and not used.
+void cgi_get_modify_group_info()
+{
+    const auto group = form_value<512>("group");
+    [[maybe_unused]] const auto type = form_value<16>("type");
+
+    write_xml_header(Charset::Plain);
+    write_xml_prologue();
+    out("<group_info>");
+    write_volume_count_and_sizes();
+    for_each_internal_volume([&](const char* volume, const char* device_dir) {
+        unsigned long long limit = 0;
+        unsigned long long other = 0;
+        LIB_Quota(103, device_dir, group.c_str(), &limit, &other);
+        out("<quota>");
+        out("<v_name>%s</v_name>", volume);
+        out("<size>%lld</size>", static_cast<long long>(limit >> 10));
+        out("</quota>");
+    });
+    out("</group_info>");
+}
