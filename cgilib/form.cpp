@@ -1,33 +1,66 @@
-// Placeholder until the request parser lands.
+// Reading the parsed form: field values, upload names, and moving uploads into place.
 #include "platform/cgic.h"
 
-#include <cstdio>
+#include <algorithm>
 #include <cstring>
 
-FILE* cgiOut = stdout;
+#include "cgilib/request.h"
 
-extern "C" cgiFormResultType cgiFormString(const char*, char* result, int max)
+namespace {
+
+// Copies `text` as a C string (up to its first NUL) into `result`: at most max-1
+// bytes, always terminated; a size of 0 or less writes nothing.
+cgiFormResultType copy_out(std::string_view text, char* result, int max)
 {
-    if (max > 0)
-        result[0] = '\0';
-    return cgiFormNotFound;
+    text = text.substr(0, text.find('\0'));
+    const std::size_t room = max > 0 ? static_cast<std::size_t>(max) - 1 : 0;
+    if (max > 0 && result != nullptr) {
+        const std::size_t count = std::min(text.size(), room);
+        if (count > 0)
+            std::memcpy(result, text.data(), count);
+        result[count] = '\0';
+    }
+    if (text.empty())
+        return cgiFormEmpty;
+    return text.size() > room ? cgiFormTruncated : cgiFormSuccess;
 }
-extern "C" cgiFormResultType cgiFormFileName(const char*, char* result, int max)
+
+cgilib::FormField* field_named(const char* name)
 {
-    if (max > 0)
-        result[0] = '\0';
-    return cgiFormNotFound;
+    return name != nullptr ? cgilib::find_field(name) : nullptr;
 }
-extern "C" cgiFormResultType cgiFormFileRename(const char*, const char*) { return cgiFormNotFound; }
-extern "C" cgiFormResultType cgiHeaderContentType(const char* mime)
+
+} // namespace
+
+extern "C" cgiFormResultType cgiFormString(const char* name, char* result, int max)
 {
-    std::fprintf(cgiOut, "Content-Type: %s\r\n\r\n", mime);
+    const cgilib::FormField* field = field_named(name);
+    if (field == nullptr) {
+        copy_out({}, result, max);
+        return cgiFormNotFound;
+    }
+    return copy_out(field->value, result, max);
+}
+
+extern "C" cgiFormResultType cgiFormFileName(const char* name, char* result, int max)
+{
+    const cgilib::FormField* field = field_named(name);
+    if (field == nullptr || !field->upload) {
+        copy_out({}, result, max);
+        return field == nullptr ? cgiFormNotFound : cgiFormNotAFile;
+    }
+    return copy_out(field->upload->client_name, result, max);
+}
+
+// A second rename of the same upload fails with cgiFormIO: the file has gone.
+extern "C" cgiFormResultType cgiFormFileRename(const char* name, const char* path)
+{
+    cgilib::FormField* field = field_named(name);
+    if (field == nullptr)
+        return cgiFormNotFound;
+    if (!field->upload)
+        return cgiFormNotAFile;
+    if (path == nullptr || !field->upload->file.move_to(path))
+        return cgiFormIO;
     return cgiFormSuccess;
 }
-extern "C" cgiFormResultType cgiHtmlEscape(const char* text)
-{
-    std::fputs(text, cgiOut);
-    return cgiFormSuccess;
-}
-extern "C" char* cgi_escapeshellarg(const char*) { return nullptr; }
-extern "C" void cgi_escapeshellarg_free(void) {}

@@ -9,6 +9,7 @@
 #include <cerrno>
 #include <csignal>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 #include <fcntl.h>
 #include <poll.h>
@@ -50,7 +51,12 @@ std::string log_line(std::string_view datagram)
     const auto close = datagram.find('>');
     if (datagram.empty() || datagram.front() != '<' || close == std::string_view::npos)
         return std::string(datagram) + '\n';
-    std::string line(datagram.substr(0, close + 1));
+    // Only the kernel logs with the kernel facility (0): like the device's syslog
+    // daemon, a program's message with facility 0 is taken as the user facility.
+    int priority = std::atoi(std::string(datagram.substr(1, close - 1)).c_str());
+    if (priority < 8)
+        priority += 8;
+    std::string line = "<" + std::to_string(priority) + ">";
     std::string_view rest = datagram.substr(close + 1);
     // "Nov 23 00:48:00 " is 16 characters.
     if (rest.size() >= 16 && rest[3] == ' ' && rest[6] == ' ' && rest[9] == ':' && rest[12] == ':' && rest[15] == ' ')

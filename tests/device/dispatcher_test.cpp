@@ -17,7 +17,6 @@ TEST(Dispatcher, UnmatchedCommandsAnswerNothing)
         {"capital letters", "cmd=CGI_GET_SERVICE_INFO"},
         {"the usual spelling of the import", "cmd=cgi_import_users"},
         {"a valid name cut at 63 characters", "cmd=" + valid + std::string(100 - valid.size(), 'x')},
-        {"an embedded NUL", "cmd=cgi_get_service_info%00x"},
         {"an empty request", ""},
     };
     for (const auto& c : cases) {
@@ -26,6 +25,13 @@ TEST(Dispatcher, UnmatchedCommandsAnswerNothing)
         EXPECT_EQ(reply.status, 0) << c.what;
     }
     EXPECT_TRUE(dev.journal().empty());
+}
+
+TEST(Dispatcher, ACommandIsReadAsTextUpToItsFirstNul)
+{
+    Device dev;
+    EXPECT_EQ(dev.get_raw("cmd=cgi_ftp_service%00junk&type=1").out, kEmptyHtml);
+    EXPECT_EQ(dev.journal().size(), 3u);
 }
 
 TEST(Dispatcher, PostedCommandsRunToo)

@@ -7,7 +7,7 @@ namespace {
 
 std::string probe(Device& dev, const std::vector<std::string>& args)
 {
-    std::vector<std::string> argv{"/sbin/volume_probe"};
+    std::vector<std::string> argv{"/sbin/shared_probe"};
     argv.insert(argv.end(), args.begin(), args.end());
     return dev.run(argv).out;
 }
@@ -41,7 +41,7 @@ TEST(VolumeTable, ResolvesNamesCountsAndSizes)
     };
     for (const auto& c : cases) {
         Device dev;
-        dev.install_probe("volume_probe");
+        dev.install_probe("shared_probe");
         if (c.table == "(none)")
             dev.remove("/etc/shared_name");
         else
@@ -55,7 +55,7 @@ TEST(VolumeTable, ResolvesNamesCountsAndSizes)
 TEST(VolumeTable, AsksTheDiskLibraryPerHardDiskLine)
 {
     Device dev;
-    dev.install_probe("volume_probe");
+    dev.install_probe("shared_probe");
     probe(dev, {"sizes"});
     EXPECT_EQ(dev.journal(), (Journal{{"LIB_Get_Disk_Size", "/mnt/HD/HD_a2"}, {"LIB_Get_Disk_Size", "/mnt/HD/HD_b2"}}));
 }
@@ -63,7 +63,7 @@ TEST(VolumeTable, AsksTheDiskLibraryPerHardDiskLine)
 TEST(ReservedAccounts, AreNeverCounted)
 {
     Device dev;
-    dev.install_probe("volume_probe");
+    dev.install_probe("shared_probe");
     // The default device: three ordinary users beside the reserved ones.
     EXPECT_EQ(probe(dev, {"users"}), "3");
     EXPECT_EQ(probe(dev, {"groups"}), "2");
@@ -82,7 +82,7 @@ TEST(ReservedAccounts, AreNeverCounted)
 TEST(SmallHelpers, RefuseMetacharactersDecodeAndEscape)
 {
     Device dev;
-    dev.install_probe("volume_probe");
+    dev.install_probe("shared_probe");
     const struct {
         std::vector<std::string> args;
         std::string printed;
@@ -99,4 +99,37 @@ TEST(SmallHelpers, RefuseMetacharactersDecodeAndEscape)
     };
     for (const auto& c : cases)
         EXPECT_EQ(probe(dev, c.args), c.printed) << c.args[0] << " " << c.args[1];
+}
+
+TEST(Trace, WritesToTheConsoleOnlyWhileSwitchedOnAndCutsLongLines)
+{
+    Device dev;
+    dev.install_probe("shared_probe");
+    probe(dev, {"trace", "10"});
+    EXPECT_EQ(dev.console(), "");
+
+    dev.trace_on();
+    probe(dev, {"trace", "10"});
+    EXPECT_EQ(dev.console(), std::string(10, 'x') + "|");
+    dev.clear_records();
+    probe(dev, {"trace", "5000"});
+    EXPECT_EQ(dev.console(), std::string(2559, 'x'));
+}
+
+TEST(EventLog, WritesAccountEventsAsSystemInformation)
+{
+    Device dev;
+    dev.install_probe("shared_probe");
+    probe(dev, {"event", "bob \"the\" builder"});
+    EXPECT_EQ(dev.messages(), (std::vector<std::string>{"<14>SYSTEM: Account \"bob \"the\" builder\" has been created.",
+                                                         "<14>SYSTEM: Admin password has been modified."}));
+}
+
+TEST(ShellRunner, AnEscapedArgumentReachesTheToolAsOneWord)
+{
+    Device dev;
+    dev.install_probe("shared_probe");
+    probe(dev, {"shell", "it's a \"word\"; rm -rf / $(id)"});
+    EXPECT_EQ(dev.journal(), (Journal{{"sh", "-c", "account -m -u 'it'\\''s a \"word\"; rm -rf / $(id)'"},
+                                      {"account", "-m", "-u", "it's a \"word\"; rm -rf / $(id)"}}));
 }

@@ -1,11 +1,17 @@
 // Runs one shared helper of the program inside a device and prints its result:
-//   volume_probe resolve SOURCE MODE | sizes | count | users | groups
-//   volume_probe metachars TEXT | base64 TEXT SIZE | element TAG VALUE | reserved_user NAME
+//   shared_probe resolve SOURCE MODE | sizes | count | users | groups
+//   shared_probe metachars TEXT | base64 TEXT SIZE | element TAG VALUE
+//   shared_probe trace LENGTH | event NAME | shell TEXT
 #include <cstdio>
 #include <cstdlib>
+#include <string>
 #include <string_view>
 
+#include "cgi/event_log.h"
 #include "cgi/fixed_text.h"
+#include "cgi/shell.h"
+#include "cgi/trace.h"
+#include "platform/cgic.h"
 #include "volumes/helpers.h"
 #include "volumes/reserved_accounts.h"
 #include "volumes/volume_table.h"
@@ -38,6 +44,15 @@ int main(int argc, char** argv)
         std::fwrite(decoded.data(), 1, decoded.capacity, stdout);
     } else if (what == "element" && argc == 4) {
         write_xml_element(argv[2], argv[3]);
+    } else if (what == "trace" && argc == 3) {
+        const std::string line(static_cast<std::size_t>(std::atoi(argv[2])), 'x');
+        printf_out("%s|", line.c_str());
+    } else if (what == "event" && argc == 3) {
+        log_event("Account \"%s\" has been created.", argv[2]);
+        log_event("Admin password has been modified.");
+    } else if (what == "shell" && argc == 3) {
+        run_shell_command("account -m -u %s", cgi_escapeshellarg(argv[2]));
+        cgi_escapeshellarg_free();
     } else {
         return 2;
     }

@@ -1,0 +1,204 @@
+// Multipart bodies: fields, uploads written byte for byte, hostile bodies, and
+// moving an upload into place.
+#include <gtest/gtest.h>
+
+#include <cstdlib>
+#include <filesystem>
+#include <fstream>
+#include <iterator>
+#include <set>
+#include <sys/stat.h>
+
+#include "cgilib/temp_file.h"
+#include "cgilib_test_support.h"
+
+using cgilib_test::form_file_name;
+using cgilib_test::form_string;
+using cgilib_test::parse;
+using cgilib_test::Read;
+using cgilib_test::TestRequest;
+namespace fs = std::filesystem;
+
+namespace {
+
+const std::string kType = "multipart/form-data; boundary=XyZ";
+
+std::string field(const std::string& name, const std::string& value)
+{
+    return "--XyZ\r\nContent-Disposition: form-data; name=\"" + name + "\"\r\n\r\n" + value + "\r\n";
+}
+
+std::string file(const std::string& name, const std::string& file_name, const std::string& content)
+{
+    return "--XyZ\r\nContent-Disposition: form-data; name=\"" + name + "\"; filename=\"" + file_name +
+           "\"\r\nContent-Type: application/octet-stream\r\n\r\n" + content + "\r\n";
+}
+
+const std::string kEnd = "--XyZ--\r\n";
+
+std::string read_file(const fs::path& path)
+{
+    std::ifstream in(path, std::ios::binary);
+    return {std::istreambuf_iterator<char>(in), {}};
+}
+
+// A directory of its own under /tmp, removed with everything in it.
+struct ScratchDir {
+    fs::path path;
+    explicit ScratchDir(fs::path base = fs::temp_directory_path())
+    {
+        std::string pattern = (base / "cgilib-test-XXXXXX").string();
+        path = ::mkdtemp(pattern.data()) ? fs::path(pattern) : fs::path();
+    }
+    ~ScratchDir()
+    {
+        if (!path.empty())
+            fs::remove_all(path);
+    }
+};
+
+// Uploads are stored in the library's own temporary files; this finds where by
+// moving the upload out and looking at what arrived.
+std::string renamed_content(const char* name, const ScratchDir& dir)
+{
+    const fs::path target = dir.path / name;
+    if (cgiFormFileRename(name, target.c_str()) != cgiFormSuccess)
+        return "<not renamed>";
+    return read_file(target);
+}
+
+} // namespace
+
+TEST(CgiMultipart, ReadsFieldsAndUploadsByteForByte)
+{
+    using namespace std::string_literals;
+    const std::string content = "line 1\r\nline 2\n\r\n--Xy-\r\n--XyQ\0\xff\x80 end\r\n"s;
+    parse({.content_type = kType,
+           .body = "preamble\r\n" + field("name", "alice") + file("upload", "C:\\dir\\users.txt", content) +
+                   field("note", "two\r\nlines") + field("name", "bob") + kEnd + "epilogue"});
+
+    EXPECT_EQ(form_string("name"), (Read{cgiFormSuccess, "alice"}));
+    EXPECT_EQ(form_string("note"), (Read{cgiFormSuccess, "two\r\nlines"}));
+    EXPECT_EQ(form_file_name("upload"), (Read{cgiFormSuccess, "C:\\dir\\users.txt"}));
+    EXPECT_EQ(form_file_name("upload", 4), (Read{cgiFormTruncated, "C:\\"}));
+    EXPECT_EQ(form_file_name("name"), (Read{cgiFormNotAFile, ""}));
+    EXPECT_EQ(form_file_name("missing"), (Read{cgiFormNotFound, ""}));
+    EXPECT_EQ(form_string("upload"), (Read{cgiFormEmpty, ""}));
+
+    const ScratchDir dir;
+    EXPECT_EQ(renamed_content("upload", dir), content);
+}
+
+// The body is read in pieces; a delimiter may fall across the seam of two of them.
+TEST(CgiMultipart, FindsDelimitersAcrossReadPieces)
+{
+    const ScratchDir dir;
+    for (std::size_t size = 65536 - 80; size < 65536 + 8; size += 3) {
+        std::string content(size, 'x');
+        for (std::size_t i = 0; i < size; i += 97)
+            content[i] = static_cast<char>(i % 251);
+        parse({.content_type = kType, .body = file("f", "f.bin", content) + field("after", "yes") + kEnd});
+        EXPECT_EQ(renamed_content("f", dir), content) << size;
+        EXPECT_EQ(form_string("after").text, "yes") << size;
+    }
+}
+
+TEST(CgiMultipart, LeavesOutWhatCannotBeRead)
+{
+    const std::string good = field("a", "1");
+    const struct {
+        std::string label, content_type, body;
+        std::optional<std::string> length;
+        cgiFormResultType a, b;
+    } cases[] = {
+        {"no boundary", "multipart/form-data", good + kEnd, {}, cgiFormNotFound, cgiFormNotFound},
+        {"empty boundary", "multipart/form-data; boundary=", good + kEnd, {}, cgiFormNotFound, cgiFormNotFound},
+        {"wrong boundary", "multipart/form-data; boundary=Other", good + kEnd, {}, cgiFormNotFound, cgiFormNotFound},
+        {"quoted boundary", "Multipart/Form-Data; boundary=\"XyZ\"", good + kEnd, {}, cgiFormSuccess,
+         cgiFormNotFound},
+        {"no delimiter at all", kType, "a=1", {}, cgiFormNotFound, cgiFormNotFound},
+        {"unterminated last part", kType, good + "--XyZ\r\nContent-Disposition: form-data; name=\"b\"\r\n\r\n2",
+         {}, cgiFormSuccess, cgiFormNotFound},
+        {"no closing delimiter", kType, good + field("b", "2"), {}, cgiFormSuccess, cgiFormNotFound},
+        {"padding on the boundary line", kType, "--XyZ \t\r\nContent-Disposition: form-data; name=a\r\n\r\n1\r\n"
+         + field("b", "2") + kEnd, {}, cgiFormSuccess, cgiFormSuccess},
+        {"part without headers", kType, "--XyZ\r\n\r\nlost\r\n" + good + kEnd, {}, cgiFormSuccess,
+         cgiFormNotFound},
+        {"part without blank line", kType, "--XyZ\r\nContent-Disposition: form-data; name=\"b\"\r\n" + good + kEnd,
+         {}, cgiFormSuccess, cgiFormNotFound},
+        {"part without a name", kType, "--XyZ\r\nContent-Disposition: form-data\r\n\r\nx\r\n" + good + kEnd, {},
+         cgiFormSuccess, cgiFormNotFound},
+        {"endless header", kType, "--XyZ\r\nX: " + std::string(40000, 'h') + "\r\n\r\n2\r\n" + good + kEnd, {},
+         cgiFormSuccess, cgiFormNotFound},
+        {"empty file name is a field", kType, good + file("b", "", "") + kEnd, {}, cgiFormSuccess, cgiFormEmpty},
+        {"length cuts into part b", kType, good + field("b", "2") + kEnd, std::to_string(good.size() + 20),
+         cgiFormSuccess, cgiFormNotFound},
+        {"length beyond the body", kType, good + field("b", "2") + kEnd, "500", cgiFormNotFound, cgiFormNotFound},
+        {"length beyond the limit", kType, good + kEnd, std::to_string(cgilib::kMaxMultipartBody + 1),
+         cgiFormNotFound, cgiFormNotFound},
+        {"negative length", kType, good + kEnd, "-5", cgiFormNotFound, cgiFormNotFound},
+    };
+    for (const auto& c : cases) {
+        parse({.content_type = c.content_type, .body = c.body, .content_length = c.length});
+        EXPECT_EQ(form_string("a").result, c.a) << c.label;
+        EXPECT_EQ(form_string("b").result, c.b) << c.label;
+    }
+}
+
+TEST(CgiMultipart, DropsUnfinishedUploadsAndRemovesOldOnes)
+{
+    const auto uploads_in_tmp = [] {
+        std::set<fs::path> found;
+        for (const auto& entry : fs::directory_iterator("/tmp")) {
+            if (entry.path().filename().string().starts_with("cgic"))
+                found.insert(entry.path());
+        }
+        return found;
+    };
+    const auto before = uploads_in_tmp();
+    parse({.content_type = kType, .body = file("f", "a.txt", "data") + kEnd});
+    EXPECT_EQ(uploads_in_tmp().size(), before.size() + 1);
+
+    // The next request replaces this one; a cut upload is not kept either.
+    parse({.content_type = kType, .body = file("f", "a.txt", "data") + "--XyZ\r\n" + file("g", "b.txt", "cut")});
+    EXPECT_EQ(form_file_name("f").result, cgiFormSuccess);
+    EXPECT_EQ(form_file_name("g").result, cgiFormNotFound);
+    EXPECT_EQ(uploads_in_tmp().size(), before.size() + 1);
+
+    parse({.method = "GET"});
+    EXPECT_EQ(uploads_in_tmp(), before);
+}
+
+TEST(CgiFormFileRename, MovesTheUploadIntoAnotherDirectory)
+{
+    const ScratchDir dir;
+    parse({.content_type = kType, .body = file("f", "a.txt", "first") + field("plain", "x") + kEnd});
+    fs::create_directory(dir.path / "sub");
+    std::ofstream(dir.path / "sub" / "target") << "old content";
+
+    EXPECT_EQ(cgiFormFileRename("plain", (dir.path / "p").c_str()), cgiFormNotAFile);
+    EXPECT_EQ(cgiFormFileRename("missing", (dir.path / "m").c_str()), cgiFormNotFound);
+    EXPECT_EQ(cgiFormFileRename("f", (dir.path / "no-such-dir" / "t").c_str()), cgiFormIO);
+    EXPECT_EQ(cgiFormFileRename("f", (dir.path / "sub" / "target").c_str()), cgiFormSuccess);
+    EXPECT_EQ(read_file(dir.path / "sub" / "target"), "first");
+    EXPECT_EQ(cgiFormFileRename("f", (dir.path / "again").c_str()), cgiFormIO);
+}
+
+// /dev/shm is a file system of its own on most machines: a rename cannot cross to
+// it, so the upload is copied there instead.
+TEST(CgiFormFileRename, CopiesAcrossFileSystems)
+{
+    struct stat tmp_stat {}, shm_stat {};
+    if (::stat("/tmp", &tmp_stat) != 0 || ::stat("/dev/shm", &shm_stat) != 0 || tmp_stat.st_dev == shm_stat.st_dev)
+        GTEST_SKIP() << "no second file system at /dev/shm";
+    const ScratchDir dir("/dev/shm");
+    const std::string content = std::string("a\0b\r\n", 5) + std::string(200000, 'z');
+
+    auto upload = cgilib::TempFile::create();
+    ASSERT_TRUE(upload && upload->write(content) && upload->finish());
+    const std::string source = upload->path();
+    EXPECT_TRUE(upload->move_to((dir.path / "moved").string()));
+    EXPECT_EQ(read_file(dir.path / "moved"), content);
+    EXPECT_FALSE(fs::exists(source));
+    EXPECT_EQ(std::distance(fs::directory_iterator(dir.path), {}), 1);   // no staging file left
+}
