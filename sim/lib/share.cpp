@@ -5,8 +5,10 @@
 #include <cstdlib>
 #include <cstring>
 #include <string>
+#include <vector>
 
 #include "journal.h"
+#include "share_store.h"
 
 extern "C" int set_default_deny(const char* name)
 {
@@ -51,9 +53,14 @@ extern "C" void free_acnt_list(struct acnt_list* list)
     list->head = nullptr;
 }
 
+// Removes the share's line from the share store and its /shares link (the folder stays).
 extern "C" int del_share(const char* name)
 {
     journal_record("del_share", {name});
+    std::vector<ShareEntry> shares = load_shares();
+    std::erase_if(shares, [name](const ShareEntry& share) { return share.name == name; });
+    save_shares(shares);
+    unlink_share(name);
     return 0;
 }
 

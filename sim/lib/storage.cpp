@@ -1,8 +1,30 @@
-// AFP shares, ISO mounts and per-volume data items of the simulated device. Not
-// built yet: each call is only an event.
+// AFP shares, ISO mounts and per-volume data items of the simulated device.
+//
+// Per-volume data items: the device keeps small files with each volume (the NFS
+// rules of its folders, "exports", and the ISO rules copied to every volume,
+// "exports_iso"). Here each item is a plain file inside the volume:
+//     <volume>/.systemfile/<name>        e.g. "/mnt/HD/HD_a2/.systemfile/exports"
+// saveDataToHiddenByVolume copies the given file there under the file's base name;
+// getDataLocationByVolume gives that path when the file exists.
 #include "platform/storage.h"
 
+#include <cstdlib>
+#include <cstring>
+#include <filesystem>
+#include <string>
+
 #include "journal.h"
+
+namespace fs = std::filesystem;
+
+namespace {
+
+std::string item_path(std::string_view volume, std::string_view name)
+{
+    return std::string(volume) + "/.systemfile/" + std::string(name);
+}
+
+} // namespace
 
 extern "C" int afpIf_delShareByPath(const char* path)
 {
@@ -19,11 +41,21 @@ extern "C" int isoMount_user_rename(const char* old_name, const char* new_name)
 extern "C" char* getDataLocationByVolume(const char* name, const char* volume)
 {
     journal_record("getDataLocationByVolume", {name, volume});
-    return nullptr;
+    const std::string path = item_path(volume, name);
+    std::error_code ignored;
+    if (!fs::is_regular_file(path, ignored))
+        return nullptr;
+    return strdup(path.c_str());
 }
 
 extern "C" int saveDataToHiddenByVolume(const char* file, const char* volume)
 {
     journal_record("saveDataToHiddenByVolume", {file, volume});
-    return 0;
+    const std::string target = item_path(volume, fs::path(file).filename().string());
+    std::error_code failed;
+    fs::create_directories(fs::path(target).parent_path(), failed);
+    if (failed)
+        return -1;
+    fs::copy_file(file, target, fs::copy_options::overwrite_existing, failed);
+    return failed ? -1 : 0;
 }
