@@ -38,14 +38,11 @@ bool save_dfs_groups(const std::vector<std::string>& groups)
 
 std::optional<std::vector<std::string>> remote_host_folders(const std::string& host)
 {
-    for (const std::string& line : read_lines(kRemoteHostsPath)) {
-        if (line.empty() || line[0] == '#')
-            continue;
-        const auto equals = line.find('=');
-        if (equals == std::string::npos || line.compare(0, equals, host) != 0 || equals != host.size())
+    for (const auto& [name, shared] : read_settings(kRemoteHostsPath)) {
+        if (name != host)
             continue;
         std::vector<std::string> folders;
-        for (std::string& folder : split(line.substr(equals + 1), ',')) {
+        for (std::string& folder : split(shared, ',')) {
             if (!folder.empty())
                 folders.push_back(std::move(folder));
         }

@@ -6,18 +6,11 @@
 
 std::optional<SimulatedDomain> load_simulated_domain()
 {
-    const std::vector<std::string> lines = read_lines(kDomainFile);
-    if (lines.empty())
+    const auto settings = read_settings(kDomainFile);
+    if (settings.empty() && read_lines(kDomainFile).empty())
         return std::nullopt;
     SimulatedDomain domain;
-    for (const std::string& line : lines) {
-        if (line.empty() || line[0] == '#')
-            continue;
-        const auto equals = line.find('=');
-        if (equals == std::string::npos)
-            continue;
-        const std::string key = line.substr(0, equals);
-        const std::string value = line.substr(equals + 1);
+    for (const auto& [key, value] : settings) {
         if (key == "realm")
             domain.realm = value;
         else if (key == "workgroup")

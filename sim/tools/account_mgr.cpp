@@ -54,17 +54,11 @@ struct Pace {
 Pace load_pace()
 {
     Pace pace;
-    for (const std::string& line : read_lines(kSettingsFile)) {
-        if (line.empty() || line[0] == '#')
-            continue;
-        const auto equals = line.find('=');
-        if (equals == std::string::npos)
-            continue;
-        const std::string key = line.substr(0, equals);
+    for (const auto& [key, value] : read_settings(kSettingsFile)) {
         if (key == "delay_ms")
-            pace.delay_ms = std::atol(line.c_str() + equals + 1);
+            pace.delay_ms = std::atol(value.c_str());
         else if (key == "gate")
-            pace.gate = line.substr(equals + 1);
+            pace.gate = value;
     }
     return pace;
 }
