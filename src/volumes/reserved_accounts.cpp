@@ -42,6 +42,9 @@ int count_listed_users()
     int count = 0;
     const UniqueFile users = open_file("/etc/passwd", "r");
     if (users) {
+        // A seek to the start lets the stream know its offset; the entry reader asks
+        // for it before every entry, and would otherwise ask the kernel each time.
+        std::fseek(users.get(), 0, SEEK_SET);
         while (const passwd* entry = fgetpwent(users.get())) {
             if (!is_reserved_user(entry->pw_name))
                 ++count;

@@ -1,0 +1,48 @@
+// The internal volume numbering: volume k (1, 2, ...) is the k-th line of the volume
+// table "/etc/shared_name" whose volume name does not contain "USB", in file order.
+// USB disks listed between hard-disk volumes take no number. The quota form fields
+// "available1" to "available4", the "%llu:%llu:%llu:%llu" answers and the volume name
+// lists of the account and quota pages all count volumes this way.
+#pragma once
+
+#include <array>
+#include <functional>
+
+#include "cgi/fixed_text.h"
+
+// One line of the table, split with "%63s = %15s".
+struct VolumeLine {
+    int number = 0;                 // k: 1 for the first internal volume
+    FixedText<64> name;             // "Volume_1"
+    FixedText<16> device_dir;       // "HD_a2"
+};
+
+// Whether the split buffers are cleared before each line, or once before the first.
+// When they are cleared once, a line that does not match the pattern (a blank line)
+// keeps the previous line's name and directory, and so repeats that volume; some
+// pages rely on that.
+enum class SplitBuffers { ClearedPerLine, ClearedOnce };
+
+// Calls `visit` for every internal volume line in file order (lines read in pieces of
+// at most 255 characters). Returns false, visiting nothing, when the table cannot be
+// opened.
+bool for_each_internal_volume(const std::function<void(const VolumeLine&)>& visit,
+                              SplitBuffers buffers = SplitBuffers::ClearedPerLine);
+
+// The quota pages work on the first four internal volumes; further ones are ignored.
+inline constexpr int kQuotaVolumes = 4;
+
+// The volume paths of internal volumes 1 to 4, each in its own 64-byte buffer:
+// "/mnt/HD/" and the device directory as `resolve_volume_path` finds it for the
+// volume's name, "null" when it does not find it, empty for a volume the table does
+// not have (or when the table cannot be opened).
+using VolumePaths = std::array<FixedText<64>, kQuotaVolumes>;
+VolumePaths map_internal_volume_paths();
+
+// The device directory of a volume path: the text after its first 8 characters
+// ("/mnt/HD/"). An empty path or "null" gives the empty text, since the buffer's
+// remaining bytes are zero.
+inline const char* device_dir_of(const FixedText<64>& path)
+{
+    return path.c_str() + 8;
+}
