@@ -6,18 +6,11 @@
 
 std::optional<SimulatedDomain> load_simulated_domain()
 {
-    const std::vector<std::string> lines = read_lines(kDomainFile);
-    if (lines.empty())
+    const auto settings = read_settings(kDomainFile);
+    if (settings.empty() && read_lines(kDomainFile).empty())
         return std::nullopt;
     SimulatedDomain domain;
-    for (const std::string& line : lines) {
-        if (line.empty() || line[0] == '#')
-            continue;
-        const auto equals = line.find('=');
-        if (equals == std::string::npos)
-            continue;
-        const std::string key = line.substr(0, equals);
-        const std::string value = line.substr(equals + 1);
+    for (const auto& [key, value] : settings) {
         if (key == "realm")
             domain.realm = value;
         else if (key == "workgroup")
@@ -32,6 +25,30 @@ std::optional<SimulatedDomain> load_simulated_domain()
             domain.trust = value;
         else if (key == "users" && !value.empty())
             domain.users = split(value, ',');
+        else if (key == "admin_user")
+            domain.admin_user = value;
+        else if (key == "admin_password")
+            domain.admin_password = value;
     }
     return domain;
+}
+
+std::string primary_dns_server()
+{
+    for (const std::string& line : read_lines(kResolverFile)) {
+        const std::vector<std::string> words = split(line, ' ');
+        if (words.size() >= 2 && words[0] == "nameserver")
+            return words[1];
+    }
+    return "";
+}
+
+bool set_dns_servers(const std::string& blank_separated)
+{
+    std::vector<std::string> lines;
+    for (const std::string& server : split(blank_separated, ' ')) {
+        if (!server.empty())
+            lines.push_back("nameserver " + server);
+    }
+    return write_lines(kResolverFile, lines);
 }

@@ -53,3 +53,15 @@ std::string join(const std::vector<std::string>& fields, char separator)
     }
     return text;
 }
+
+std::vector<std::pair<std::string, std::string>> read_settings(const std::string& path)
+{
+    std::vector<std::pair<std::string, std::string>> settings;
+    for (const std::string& line : read_lines(path)) {
+        const auto equals = line.find('=');
+        if (line.empty() || line[0] == '#' || equals == std::string::npos)
+            continue;
+        settings.emplace_back(line.substr(0, equals), line.substr(equals + 1));
+    }
+    return settings;
+}

@@ -3,6 +3,7 @@
 
 #include <string>
 #include <string_view>
+#include <utility>
 #include <vector>
 
 // The file's lines without their line ends; empty when the file is missing.
@@ -13,3 +14,6 @@ bool write_lines(const std::string& path, const std::vector<std::string>& lines)
 // Splits at every `separator`; "a\t\tb" gives three fields.
 std::vector<std::string> split(std::string_view text, char separator);
 std::string join(const std::vector<std::string>& fields, char separator);
+// The KEY=VALUE lines of a settings file, in file order; empty lines, lines starting
+// with "#" and lines without "=" are skipped. Empty when the file is missing.
+std::vector<std::pair<std::string, std::string>> read_settings(const std::string& path);

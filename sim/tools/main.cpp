@@ -21,7 +21,7 @@ constexpr std::array<Tool, 22> kTools{{
     {"exportfs", record_only},
     {"afp", record_only},
     {"ftp", record_only},
-    {"network", record_only},
+    {"network", tool_network},
     {"smbcmd", record_only},
     {"net", tool_net},
     {"wbinfo", tool_wbinfo},

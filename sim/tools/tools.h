@@ -28,6 +28,8 @@ int tool_chfn(int argc, char** argv);
 int tool_wbinfo(int argc, char** argv);
 // net.cpp
 int tool_net(int argc, char** argv);
+// network.cpp
+int tool_network(int argc, char** argv);
 
 // acl.cpp
 int tool_getfacl(int argc, char** argv);

@@ -4,7 +4,9 @@
 #pragma once
 
 #include <array>
+#include <cstdarg>
 #include <cstddef>
+#include <cstdio>
 #include <cstring>
 #include <string_view>
 
@@ -34,6 +36,16 @@ public:
     {
         clear();
         std::memcpy(m_bytes.data(), text.data(), std::min(text.size(), N - 1));
+    }
+
+    // Bounded formatting into the buffer: longer output is cut to N-1 bytes, which is
+    // how the device's fixed-size lines behave.
+    void format(const char* pattern, ...) __attribute__((format(printf, 2, 3)))
+    {
+        va_list args;
+        va_start(args, pattern);
+        std::vsnprintf(m_bytes.data(), N, pattern, args);
+        va_end(args);
     }
 
     bool operator==(std::string_view other) const { return view() == other; }

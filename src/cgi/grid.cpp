@@ -22,6 +22,12 @@ int FilteredPageCounter::offer(bool passes_filter)
     return ++m_count;
 }
 
+ListPageRange::ListPageRange(long page, long rows_per_page)
+    : m_first((page - 1) * rows_per_page)
+    , m_end(page * rows_per_page)
+{
+}
+
 long paging_number(const char* text)
 {
     return std::strtol(text, nullptr, 10);

@@ -24,6 +24,20 @@ private:
     int m_count = 0;
 };
 
+// Which items of a list a page shows, as the DFS grids count them: items are numbered
+// from 0 in list order (the caller decides which items count at all), and item i is
+// shown on page P of R rows when (P-1)*R <= i < P*R, with the row id i+1. There is no
+// search filter here, and the total is simply the number of items counted.
+class ListPageRange {
+public:
+    ListPageRange(long page, long rows_per_page);
+    bool shows(long index) const { return m_first <= index && index < m_end; }
+
+private:
+    long m_first;
+    long m_end;
+};
+
 // The decimal value of a paging field as the pages send it ("abc" and "" give 0).
 long paging_number(const char* text);
 
