@@ -2,8 +2,6 @@
 #pragma once
 
 #include <cstdio>
-#include <fstream>
-#include <iterator>
 #include <pwd.h>
 #include <string>
 
@@ -17,10 +15,13 @@
 template <typename Visit>
 bool for_each_password_entry(const char* path, Visit visit)
 {
-    std::ifstream file(path, std::ios::binary);
+    const UniqueFile file = open_file(path, "r");
     if (!file)
         return false;
-    std::string text((std::istreambuf_iterator<char>(file)), std::istreambuf_iterator<char>());
+    std::string text;
+    std::string chunk(64 * 1024, '\0');
+    while (const std::size_t got = std::fread(chunk.data(), 1, chunk.size(), file.get()))
+        text.append(chunk, 0, got);
     if (text.empty())
         return true;
     const UniqueFile entries(fmemopen(text.data(), text.size(), "r"));
