@@ -79,11 +79,10 @@ TEST(ExportsFormat, ChoosesFolderTextIdsAndHost)
          rule("/mnt/USB/USB1_c1/a", "h", "rw", "500,anongid=1000")},
         {"no mount table: no vfat", "(none)", {"/mnt/USB/USB1_c1/a", "h", "1", "1", "0"},
          rule("/mnt/USB/USB1_c1/a", "h", "rw", "0,anongid=0")},
-        {"any vfat mount counts", "/dev/sdd1 /media/card vfat rw 0 0\n", {"/mnt/USB/USB1_c1/a", "h", "1", "1", "1"},
-         rule("/mnt/USB/USB1_c1/a", "h", "rw", "500,anongid=1000")},
         {"USB behind a share link", kVfatMount, {"/mnt/USB/USB1_c1/linked", "h", "0", "1", "0"},
          rule("/nfs/usbshare", "h", "ro", "500,anongid=1000")},
-        {"USB copy ignores the link", kVfatMount, {"/mnt/USB/USB1_c1/linked", "h", "1", "1", "1"},
+        {"USB copy ignores the link; any vfat mount counts", "/dev/sdd1 /media/card vfat rw 0 0\n",
+         {"/mnt/USB/USB1_c1/linked", "h", "1", "1", "1"},
          rule("/mnt/USB/USB1_c1/linked", "h", "rw", "500,anongid=1000")},
     };
     for (const auto& c : cases) {
