@@ -10,17 +10,24 @@ namespace {
 
 const std::string kBoundary = "----nasBoundary7MA4YWxk";
 
-// A multipart body as a browser sends it: the command field, then the file.
-std::string upload_body(const std::string& file_name, const std::string& content)
+// A multipart upload as a browser sends it: the command field, then the file part, if any.
+Reply upload(Device& dev, const std::string& file_part)
 {
-    return "--" + kBoundary + "\r\n"
-           "Content-Disposition: form-data; name=\"cmd\"\r\n\r\n"
-           "cgi_import_uesrs\r\n"
-           "--" + kBoundary + "\r\n"
-           "Content-Disposition: form-data; name=\"fileToUpload\"; filename=\"" + file_name + "\"\r\n"
-           "Content-Type: text/plain\r\n\r\n" +
-           content + "\r\n"
-           "--" + kBoundary + "--\r\n";
+    return dev.post_raw("--" + kBoundary + "\r\nContent-Disposition: form-data; name=\"cmd\"\r\n\r\n"
+                        "cgi_import_uesrs\r\n" + file_part + "--" + kBoundary + "--\r\n",
+                        "multipart/form-data; boundary=" + kBoundary);
+}
+
+std::string file_part(const std::string& file_name, const std::string& content)
+{
+    return "--" + kBoundary + "\r\nContent-Disposition: form-data; name=\"fileToUpload\"; filename=\"" + file_name +
+           "\"\r\nContent-Type: text/plain\r\n\r\n" + content + "\r\n";
+}
+
+std::string download(const std::string& name, const std::string& content)
+{
+    return "Content-Disposition: attachment;filename=\"" + name + "\"\r\nContent-Length: " +
+           std::to_string(content.size()) + "\r\nConnection: Keep-Alive\r\nContent-Type: text/html\r\n\r\n" + content;
 }
 
 std::string items(const std::vector<std::string>& lines)
@@ -38,23 +45,14 @@ TEST(ImportUpload, TheUploadedFileBecomesTheUserImportFile)
     Device dev;
     dev.write_file("/tmp/import_users", "old\tfile\n");
     const std::string content = "jdoe\tpw1\tfamily\r\n# a comment\r\nmsmith\tpw2\t\r\n";
-    const Reply reply = dev.post_raw(upload_body("users from 'HR'.txt", content),
-                                     "multipart/form-data; boundary=" + kBoundary);
-    EXPECT_EQ(reply.out, kEmptyHtml);
+    EXPECT_EQ(upload(dev, file_part("users from 'HR'.txt", content)).out, kEmptyHtml);
     EXPECT_EQ(dev.read_file("/tmp/import_users"), content);
     EXPECT_TRUE(dev.journal().empty());   // nothing is created before the page asks
-
     EXPECT_EQ(dev.request("cgi_get_import_uesrs"), xml_utf8_answer(items({"jdoe\tpw1\tfamily", "msmith\tpw2\t"})));
-}
 
-TEST(ImportUpload, WithoutAFileThePreviousOneStays)
-{
-    Device dev;
-    dev.write_file("/tmp/import_users", "old\n");
-    const std::string body = "--" + kBoundary + "\r\nContent-Disposition: form-data; name=\"cmd\"\r\n\r\n"
-                             "cgi_import_uesrs\r\n--" + kBoundary + "--\r\n";
-    EXPECT_EQ(dev.post_raw(body, "multipart/form-data; boundary=" + kBoundary).out, kEmptyHtml);
-    EXPECT_EQ(dev.read_file("/tmp/import_users"), "old\n");
+    // Without a file the previous one stays.
+    EXPECT_EQ(upload(dev, "").out, kEmptyHtml);
+    EXPECT_EQ(dev.read_file("/tmp/import_users"), content);
 }
 
 TEST(ImportLists, ShowTheRecordLinesOfEitherFile)
@@ -86,7 +84,11 @@ TEST(ImportLists, ShowTheRecordLinesOfEitherFile)
 
 TEST(ImportCreate, StartsAccountMgrInTheBackground)
 {
-    const std::string quotes(63, '\'');
+    // An "app" of 63 quotes escapes to a line longer than 255 bytes, which is cut there.
+    std::string escaped = "'";
+    for (int i = 0; i < 63; ++i)
+        escaped += "'\\''";
+    const std::string quoted_line = "(account_mgr -u -f '/tmp/import_users' -t " + escaped + "' -o '' >/dev/null 2>&1) &";
     const struct {
         const char* what;
         std::string cmd;
@@ -101,22 +103,14 @@ TEST(ImportCreate, StartsAccountMgrInTheBackground)
          "(account_mgr -u -f '/tmp/import_users' -t '' -o '' >/dev/null 2>&1) &"},
         {"overwrite cut to 7 bytes", "cgi_create_import_groups", {{"overwrite", "123456789"}, {"app", "x"}},
          "(account_mgr -g -f '/tmp/import_groups' -t 'x' -o '1234567' >/dev/null 2>&1) &"},
+        {"the line is cut to 255 bytes", "cgi_create_import_users", {{"app", std::string(63, '\'')}},
+         quoted_line.substr(0, 255)},
     };
     for (const auto& c : cases) {
         Device dev;
         EXPECT_EQ(dev.request(c.cmd, c.fields), kEmptyHtml) << c.what;
         EXPECT_EQ(shell_lines(dev.journal()), std::vector<std::string>{c.line}) << c.what;
     }
-
-    // The line is cut to 255 bytes: an "app" of quotes escapes to more than that.
-    Device dev;
-    EXPECT_EQ(dev.request("cgi_create_import_users", {{"app", quotes}}), kEmptyHtml);
-    std::string escaped = "'";
-    for (int i = 0; i < 63; ++i)
-        escaped += "'\\''";
-    escaped += "'";
-    const std::string full = "(account_mgr -u -f '/tmp/import_users' -t " + escaped + " -o '' >/dev/null 2>&1) &";
-    EXPECT_EQ(shell_lines(dev.journal()), std::vector<std::string>{full.substr(0, 255)});
 }
 
 TEST(CreateStatus, ReadsTheMarkerOfTheKindAndThenTheResultLines)
@@ -161,26 +155,19 @@ TEST(CreateStatus, ReadsTheMarkerOfTheKindAndThenTheResultLines)
 TEST(ImportSamples, DownloadWithTheirOwnHeaders)
 {
     Device dev;
-    for (const auto& [cmd, path, name] :
-         {std::tuple{"cgi_download_import_sample", "/var/www/web/users/import_file.txt", "import_file.txt"},
-          std::tuple{"cgi_download_import_group_sample", "/var/www/web/users/import_group.txt", "import_group.txt"}}) {
-        const std::string content = dev.read_file(path);
+    for (const std::string name : {"import_file.txt", "import_group.txt"}) {
+        const std::string content = dev.read_file("/var/www/web/users/" + name);
         ASSERT_FALSE(content.empty()) << name;
-        EXPECT_EQ(dev.request(cmd), "Content-Disposition: attachment;filename=\"" + std::string(name) +
-                                        "\"\r\nContent-Length: " + std::to_string(content.size()) +
-                                        "\r\nConnection: Keep-Alive\r\nContent-Type: text/html\r\n\r\n" + content)
-            << name;
+        EXPECT_EQ(dev.request(name == "import_file.txt" ? "cgi_download_import_sample" : "cgi_download_import_group_sample"),
+                  download(name, content));
     }
 
-    // Binary content larger than one 2048-byte chunk comes through unchanged.
+    // Binary content larger than one 2048-byte chunk comes through unchanged; no file, no answer.
     std::string binary;
     for (int i = 0; i < 5000; ++i)
         binary += static_cast<char>(i % 256);
     dev.write_file("/var/www/web/users/import_file.txt", binary);
-    EXPECT_EQ(dev.request("cgi_download_import_sample"),
-              "Content-Disposition: attachment;filename=\"import_file.txt\"\r\nContent-Length: 5000\r\n"
-              "Connection: Keep-Alive\r\nContent-Type: text/html\r\n\r\n" + binary);
-
+    EXPECT_EQ(dev.request("cgi_download_import_sample"), download("import_file.txt", binary));
     dev.remove("/var/www/web/users/import_group.txt");
     EXPECT_EQ(dev.request("cgi_download_import_group_sample"), "");
 }

@@ -1,6 +1,5 @@
 // Runs one piece of the NFS exports engine inside a device and prints its result:
 //   nfs_probe format FOLDER HOST RW ROOT_SQUASH HIDDEN     the line, in brackets
-//   nfs_probe link FOLDER | vfat FOLDER | acl FOLDER        result (and the link name)
 //   nfs_probe add|hadd FOLDER HOST RW ROOT_SQUASH           the operation's result
 //   nfs_probe modify|hmodify FOLDER HOST NEWIP RW ROOT_SQUASH
 //   nfs_probe delete|hdelete FOLDER HOST
@@ -26,14 +25,6 @@ int main(int argc, char** argv)
         FixedText<512> line;
         make_config_string(folder, host, number(4), number(5), line, number(6));
         std::printf("[%s]", line.c_str());
-    } else if (what == "link") {
-        FixedText<512> name;
-        const int result = find_share_link_name("/shares", folder, name);
-        std::printf("%d [%s]", result, name.c_str());
-    } else if (what == "vfat") {
-        std::printf("%d", is_mount_type(folder, "vfat"));
-    } else if (what == "acl") {
-        std::printf("%d", has_default_acl(folder));
     } else if (what == "add" && argc == 6) {
         std::printf("%d", add_config_string(folder, host, number(4), number(5)));
     } else if (what == "hadd" && argc == 6) {

@@ -44,12 +44,10 @@ std::string read_file(const fs::path& path)
 
 // A directory of its own under /tmp, removed with everything in it.
 struct ScratchDir {
+    std::string pattern;
     fs::path path;
-    explicit ScratchDir(fs::path base = fs::temp_directory_path())
-    {
-        std::string pattern = (base / "cgilib-test-XXXXXX").string();
-        path = ::mkdtemp(pattern.data()) ? fs::path(pattern) : fs::path();
-    }
+    explicit ScratchDir(const fs::path& base = fs::temp_directory_path())
+        : pattern((base / "cgilib-test-XXXXXX").string()), path(::mkdtemp(pattern.data()) ? pattern : "") {}
     ~ScratchDir()
     {
         if (!path.empty())
@@ -105,38 +103,31 @@ TEST(CgiMultipart, FindsDelimitersAcrossReadPieces)
 
 TEST(CgiMultipart, LeavesOutWhatCannotBeRead)
 {
-    const std::string good = field("a", "1");
+    const std::string good = field("a", "1"), two = good + field("b", "2") + kEnd;
+    const auto ok = cgiFormSuccess, none = cgiFormNotFound;
     const struct {
         std::string label, content_type, body;
-        std::optional<std::string> length;
         cgiFormResultType a, b;
+        std::optional<std::string> length = {};
     } cases[] = {
-        {"no boundary", "multipart/form-data", good + kEnd, {}, cgiFormNotFound, cgiFormNotFound},
-        {"empty boundary", "multipart/form-data; boundary=", good + kEnd, {}, cgiFormNotFound, cgiFormNotFound},
-        {"wrong boundary", "multipart/form-data; boundary=Other", good + kEnd, {}, cgiFormNotFound, cgiFormNotFound},
-        {"quoted boundary", "Multipart/Form-Data; boundary=\"XyZ\"", good + kEnd, {}, cgiFormSuccess,
-         cgiFormNotFound},
-        {"no delimiter at all", kType, "a=1", {}, cgiFormNotFound, cgiFormNotFound},
-        {"unterminated last part", kType, good + "--XyZ\r\nContent-Disposition: form-data; name=\"b\"\r\n\r\n2",
-         {}, cgiFormSuccess, cgiFormNotFound},
-        {"no closing delimiter", kType, good + field("b", "2"), {}, cgiFormSuccess, cgiFormNotFound},
-        {"padding on the boundary line", kType, "--XyZ \t\r\nContent-Disposition: form-data; name=a\r\n\r\n1\r\n"
-         + field("b", "2") + kEnd, {}, cgiFormSuccess, cgiFormSuccess},
-        {"part without headers", kType, "--XyZ\r\n\r\nlost\r\n" + good + kEnd, {}, cgiFormSuccess,
-         cgiFormNotFound},
-        {"part without blank line", kType, "--XyZ\r\nContent-Disposition: form-data; name=\"b\"\r\n" + good + kEnd,
-         {}, cgiFormSuccess, cgiFormNotFound},
-        {"part without a name", kType, "--XyZ\r\nContent-Disposition: form-data\r\n\r\nx\r\n" + good + kEnd, {},
-         cgiFormSuccess, cgiFormNotFound},
-        {"endless header", kType, "--XyZ\r\nX: " + std::string(40000, 'h') + "\r\n\r\n2\r\n" + good + kEnd, {},
-         cgiFormSuccess, cgiFormNotFound},
-        {"empty file name is a field", kType, good + file("b", "", "") + kEnd, {}, cgiFormSuccess, cgiFormEmpty},
-        {"length cuts into part b", kType, good + field("b", "2") + kEnd, std::to_string(good.size() + 20),
-         cgiFormSuccess, cgiFormNotFound},
-        {"length beyond the body", kType, good + field("b", "2") + kEnd, "500", cgiFormNotFound, cgiFormNotFound},
-        {"length beyond the limit", kType, good + kEnd, std::to_string(cgilib::kMaxMultipartBody + 1),
-         cgiFormNotFound, cgiFormNotFound},
-        {"negative length", kType, good + kEnd, "-5", cgiFormNotFound, cgiFormNotFound},
+        {"no boundary", "multipart/form-data", good + kEnd, none, none},
+        {"empty boundary", "multipart/form-data; boundary=", good + kEnd, none, none},
+        {"wrong boundary", "multipart/form-data; boundary=Other", good + kEnd, none, none},
+        {"quoted boundary", "Multipart/Form-Data; boundary=\"XyZ\"", good + kEnd, ok, none},
+        {"no delimiter at all", kType, "a=1", none, none},
+        {"unterminated last part", kType, good + "--XyZ\r\nContent-Disposition: form-data; name=\"b\"\r\n\r\n2", ok, none},
+        {"no closing delimiter", kType, good + field("b", "2"), ok, none},
+        {"padding on the boundary line", kType,
+         "--XyZ \t\r\nContent-Disposition: form-data; name=a\r\n\r\n1\r\n" + field("b", "2") + kEnd, ok, ok},
+        {"part without headers", kType, "--XyZ\r\n\r\nlost\r\n" + good + kEnd, ok, none},
+        {"part without blank line", kType, "--XyZ\r\nContent-Disposition: form-data; name=\"b\"\r\n" + good + kEnd, ok, none},
+        {"part without a name", kType, "--XyZ\r\nContent-Disposition: form-data\r\n\r\nx\r\n" + good + kEnd, ok, none},
+        {"endless header", kType, "--XyZ\r\nX: " + std::string(40000, 'h') + "\r\n\r\n2\r\n" + good + kEnd, ok, none},
+        {"empty file name is a field", kType, good + file("b", "", "") + kEnd, ok, cgiFormEmpty},
+        {"length cuts into part b", kType, two, ok, none, std::to_string(good.size() + 20)},
+        {"length beyond the body", kType, two, none, none, "500"},
+        {"length beyond the limit", kType, good + kEnd, none, none, std::to_string(cgilib::kMaxMultipartBody + 1)},
+        {"negative length", kType, good + kEnd, none, none, "-5"},
     };
     for (const auto& c : cases) {
         parse({.content_type = c.content_type, .body = c.body, .content_length = c.length});

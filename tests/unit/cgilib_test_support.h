@@ -60,14 +60,7 @@ Read read_into(ReadFunction read, const char* name, int size)
     return {result, buffer.substr(0, end)};
 }
 
-inline Read form_string(const char* name, int size = 256)
-{
-    return read_into(cgiFormString, name, size);
-}
-
-inline Read form_file_name(const char* name, int size = 256)
-{
-    return read_into(cgiFormFileName, name, size);
-}
+inline Read form_string(const char* name, int size = 256) { return read_into(cgiFormString, name, size); }
+inline Read form_file_name(const char* name, int size = 256) { return read_into(cgiFormFileName, name, size); }
 
 } // namespace cgilib_test

@@ -51,15 +51,9 @@ TEST(CgiFormString, CutsToSizeLessOneAndTerminates)
         int size;
         Read expected;
     } cases[] = {
-        {"a", 7, {cgiFormSuccess, "abcdef"}},
-        {"a", 6, {cgiFormTruncated, "abcde"}},
-        {"a", 2, {cgiFormTruncated, "a"}},
-        {"a", 1, {cgiFormTruncated, ""}},
-        {"a", 0, {cgiFormTruncated, ""}},
-        {"a", -4, {cgiFormTruncated, ""}},
-        {"e", 0, {cgiFormEmpty, ""}},
-        {"missing", 8, {cgiFormNotFound, ""}},
-        {"missing", 0, {cgiFormNotFound, ""}},
+        {"a", 7, {cgiFormSuccess, "abcdef"}}, {"a", 6, {cgiFormTruncated, "abcde"}}, {"a", 2, {cgiFormTruncated, "a"}},
+        {"a", 1, {cgiFormTruncated, ""}}, {"a", 0, {cgiFormTruncated, ""}}, {"a", -4, {cgiFormTruncated, ""}},
+        {"e", 0, {cgiFormEmpty, ""}}, {"missing", 8, {cgiFormNotFound, ""}}, {"missing", 0, {cgiFormNotFound, ""}},
     };
     for (const auto& c : cases)
         EXPECT_EQ(form_string(c.name, c.size), c.expected) << c.name << " in " << c.size;
@@ -91,12 +85,10 @@ TEST(CgiUrlencodedBody, ReadsNoMoreThanContentLengthAndDropsShortBodies)
     } cases[] = {
         {"a=12345", "3", {cgiFormSuccess, "1"}, 3},
         {"a=1", "9", {cgiFormNotFound, ""}, 3},        // cut short: dropped whole
-        {"a=1", "", {cgiFormNotFound, ""}, 0},
-        {"a=1", "abc", {cgiFormNotFound, ""}, 0},
-        {"a=1", "3x", {cgiFormNotFound, ""}, 0},
-        {"a=1", " 3", {cgiFormNotFound, ""}, 0},
-        {"a=1", "-1", {cgiFormNotFound, ""}, 0},
-        {"a=1", "0", {cgiFormNotFound, ""}, 0},
+        // Lengths that are no plain positive number read nothing.
+        {"a=1", "", {cgiFormNotFound, ""}, 0}, {"a=1", "abc", {cgiFormNotFound, ""}, 0},
+        {"a=1", "3x", {cgiFormNotFound, ""}, 0}, {"a=1", " 3", {cgiFormNotFound, ""}, 0},
+        {"a=1", "-1", {cgiFormNotFound, ""}, 0}, {"a=1", "0", {cgiFormNotFound, ""}, 0},
         {"a=1", "99999999999999999999999", {cgiFormNotFound, ""}, 0},
         {"a=1", std::to_string(cgilib::kMaxUrlencodedBody + 1), {cgiFormNotFound, ""}, 0},
     };

@@ -15,21 +15,10 @@ namespace {
 const std::string kOptions = "sync,no_wdelay,insecure_locks,insecure,no_subtree_check,anonuid=501,anongid=1000)";
 
 // A file the parser reads, removed again afterwards.
-class TempFile {
-public:
-    explicit TempFile(const std::string& content)
-    {
-        std::string pattern = ::testing::TempDir() + "/exports.XXXXXX";
-        const int fd = mkstemp(pattern.data());
-        close(fd);
-        m_path = pattern;
-        std::ofstream(m_path, std::ios::binary) << content;
-    }
-    ~TempFile() { std::remove(m_path.c_str()); }
-    const char* path() const { return m_path.c_str(); }
-
-private:
-    std::string m_path;
+struct TempFile {
+    std::string path = ::testing::TempDir() + "/exports." + std::to_string(getpid());
+    explicit TempFile(const std::string& content) { std::ofstream(path, std::ios::binary) << content; }
+    ~TempFile() { std::remove(path.c_str()); }
 };
 
 // Each record after the head as "volume|ip|rw|root_squash", a cleared one as "-".
@@ -83,7 +72,7 @@ TEST(ExportsParser, ParsesLinesAndKeepsClearedRecords)
     };
     for (const auto& c : cases) {
         const TempFile file(c.content);
-        const ExportsList list = load_exports_config(file.path());
+        const ExportsList list = load_exports_config(file.path.c_str());
         ASSERT_TRUE(list) << c.what;
         EXPECT_EQ(records_of(list), c.records) << c.what;
         EXPECT_EQ(count_records(list), static_cast<int>(c.records.size())) << c.what;
@@ -101,7 +90,7 @@ TEST(ExportsParser, ReleasesALongListWithoutRecursing)
     for (int i = 0; i < 50000; ++i)
         content += "\"/v" + std::to_string(i) + "\" h(rw,x)\n";
     const TempFile file(content);
-    ExportsList list = load_exports_config(file.path());
+    ExportsList list = load_exports_config(file.path.c_str());
     ASSERT_TRUE(list);
     EXPECT_EQ(count_records(list), 50000);
     list.reset();
