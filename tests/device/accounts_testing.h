@@ -24,24 +24,19 @@ inline Journal concat(std::initializer_list<Journal> parts)
 inline Journal ran(const std::string& line)
 {
     Event argv{""};
-    bool quoted = false, redirected = false;
-    for (std::size_t i = 0; i < line.size() && !redirected; ++i) {
-        const char ch = line[i];
-        if (ch == '\'' || ch == '"') {
-            const std::size_t end = line.find(ch, i + 1);
+    bool quoted = false;    // the word so far had quotes, so it counts even when empty
+    for (std::size_t i = 0; i < line.size() && line[i] != '>'; ++i) {
+        if (line[i] == '\'' || line[i] == '"') {
+            const std::size_t end = line.find(line[i], i + 1);
             argv.back() += line.substr(i + 1, end - i - 1);
             quoted = true;
             i = end;
-        } else if (ch == '\\') {
-            argv.back() += line[++i];
-        } else if (ch == ' ') {
+        } else if (line[i] != ' ') {
+            argv.back() += line[i] == '\\' ? line[++i] : line[i];
+        } else {
             if (!argv.back().empty() || quoted)
                 argv.push_back("");
             quoted = false;
-        } else if (ch == '>') {
-            redirected = true;
-        } else {
-            argv.back() += ch;
         }
     }
     if (argv.back().empty() && !quoted)
@@ -129,15 +124,6 @@ inline bool password_verifies(Device& dev, std::string_view user, const std::str
     return dev.run({"/usr/bin/perl", "-e", "print crypt($ARGV[0], $ARGV[1])", password, hash}).out == hash;
 }
 
-// The folder a device path resolves to inside the device ("" when it does not exist).
-inline std::string resolved(Device& dev, const std::string& path)
-{
-    std::string out = dev.run({"/usr/bin/realpath", "-e", path}).out;
-    if (!out.empty() && out.back() == '\n')
-        out.pop_back();
-    return out;
-}
-
 // Volume tables: one, two and four internal volumes, a USB disk between two, none.
 inline const std::string kOne = "Volume_1 = HD_a2\n";
 inline const std::string kTwo = "Volume_1 = HD_a2\nVolume_2 = HD_b2\n";
@@ -145,17 +131,14 @@ inline const std::string kFour = "Volume_1 = HD_a2\nVolume_2 = HD_b2\nVolume_3 =
 inline const std::string kUsbBetween = "Volume_1 = HD_a2\nUSB_1 = sdc1\nVolume_2 = HD_b2\n";
 inline const std::string kNone = "(none)";   // no shared_name file at all
 
-// Writes the volume table; kNone removes it. The image's disks size HD_a2 1877538 and
-// HD_b2 937795 (kilobytes / 1024); with `four_disks` HD_c2 4096 and HD_d2 2048 as well.
-inline void set_volume_table(Device& dev, const std::string& table, bool four_disks = false)
+// Writes the volume table (kNone removes it) and disks of 1877538, 937795, 4096 and
+// 2048 megabytes for HD_a2 to HD_d2.
+inline void set_volume_table(Device& dev, const std::string& table)
 {
     if (table == kNone)
         dev.remove("/etc/shared_name");
     else
         dev.write_file("/etc/shared_name", table);
-    if (four_disks)
-        dev.write_file("/sim/disks", "/mnt/HD/HD_a2 1922599448 48211960 1874387488\n"
-                                     "/mnt/HD/HD_b2 960302096 1048576 959253520\n"
-                                     "/mnt/HD/HD_c2 4194304 0 4194304\n"
-                                     "/mnt/HD/HD_d2 2097152 0 2097152\n");
+    dev.write_file("/sim/disks", "/mnt/HD/HD_a2 1922599448 48211960 1874387488\n/mnt/HD/HD_b2 960302096 1048576 959253520\n"
+                                 "/mnt/HD/HD_c2 4194304 0 4194304\n/mnt/HD/HD_d2 2097152 0 2097152\n");
 }

@@ -52,7 +52,7 @@ TEST(GroupAdd, CutsTheBackgroundQuotaLineAt127Characters)
     EXPECT_EQ(logged(dev), std::vector<std::string>{"SYSTEM: Group \"" + name + "\" has been created."});
 }
 
-TEST(GroupDel, DeletesEachListedGroup)
+TEST(GroupDel, DeletesEachListedGroupKeepingItsMembers)
 {
     const Journal family_office = concat({deletion_of("family", "family", "1004"), deletion_of("office", "family", "1005")});
     const std::vector<std::string> both{"SYSTEM: Group \"family\" has been deleted.", "SYSTEM: Group \"office\" has been deleted."};
@@ -64,12 +64,15 @@ TEST(GroupDel, DeletesEachListedGroup)
     } cases[] = {
         {"two groups: the clean-up names the first twice", "family,office", family_office, both},
         {"empty items are skipped", "family,,office", family_office, both},
+        {"one group", "family", deletion_of("family", "family", "1004"), {both[0]}},
         {"a name that is no group has no id to look for", "ghost", deletion_of("ghost", "ghost", ""),
          {"SYSTEM: Group \"ghost\" has been deleted."}},
         {"only a comma", ",", {}, {}},
     };
     for (const auto& c : cases) {
         Device dev;
+        dev.write_file("/etc/passwd", dev.read_file("/etc/passwd") + "fam:x:1010:1004:,,,,:/shares/fam:/bin/sh\n");
+        dev.write_file("/var/lib/platform/quota", "g\tHD_a2\tfamily\t2048\ng\tHD_a2\toffice\t4096\n");
         EXPECT_EQ(dev.request("cgi_group_del", {{"group", c.list}}), kEmptyHtml) << c.what;
         EXPECT_EQ(dev.journal(), concat({{{"LIB_WEB_STOP_FTP"}}, c.deletions,
                                          {{"LIB_Rejoin_Other_Group_Quota"}, {"LIB_WEB_START_FTP"}}, reload_events(),
@@ -77,21 +80,14 @@ TEST(GroupDel, DeletesEachListedGroup)
                                           {"sh", "-c", "makedav start > /dev/null 2>&1 &"}, {"makedav", "start"}}}))
             << c.what;
         EXPECT_EQ(logged(dev), c.events) << c.what;
+        if (c.list != "family")
+            continue;
+        EXPECT_EQ(account_line(dev, "/etc/group", "family"), "(none)");
+        EXPECT_EQ(account_field(dev, "/etc/passwd", "fam", 3), "1000");     // its primary group falls back
+        EXPECT_EQ(dev.read_file("/tmp/tmp_old_group_etc_passwd_user.quota"), "fam:x:1010:1004:,,,,:/shares/fam:/bin/sh\n");
+        EXPECT_EQ(dev.read_file("/var/lib/platform/quota"), "g\tHD_a2\toffice\t4096\n");
+        EXPECT_EQ(dev.read_file("/var/lib/platform/shares").find("@family"), std::string::npos);   // its access entry
     }
-}
-
-TEST(GroupDel, RemovesTheGroupAndKeepsItsMembersLines)
-{
-    Device dev;
-    dev.write_file("/etc/passwd", dev.read_file("/etc/passwd") + "fam:x:1010:1004:,,,,:/shares/fam:/bin/sh\n");
-    dev.write_file("/var/lib/platform/quota", "g\tHD_a2\tfamily\t2048\ng\tHD_a2\toffice\t4096\n");
-    dev.request("cgi_group_del", {{"group", "family"}});
-    EXPECT_EQ(account_line(dev, "/etc/group", "family"), "(none)");
-    EXPECT_EQ(account_field(dev, "/etc/passwd", "fam", 3), "1000");     // its primary group falls back
-    EXPECT_EQ(dev.read_file("/tmp/tmp_old_group_etc_passwd_user.quota"), "fam:x:1010:1004:,,,,:/shares/fam:/bin/sh\n");
-    EXPECT_EQ(dev.read_file("/var/lib/platform/quota"), "g\tHD_a2\toffice\t4096\n");
-    // The share store's clean-up removed the group's access entry.
-    EXPECT_EQ(dev.read_file("/var/lib/platform/shares").find("@family"), std::string::npos);
 }
 
 TEST(GroupInfo, NamesTheInternalVolumes)

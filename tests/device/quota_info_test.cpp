@@ -38,7 +38,7 @@ TEST(QuotaInfo, NamesTheFirstFourInternalVolumes)
     };
     for (const auto& c : cases) {
         Device dev;
-        set_volume_table(dev, c.table, true);
+        set_volume_table(dev, c.table);
         EXPECT_EQ(dev.request("cgi_get_quota_info"), xml_utf8_answer(overview(c.num, c.sizes, "3", "2", "1", c.names)))
             << c.what;
         EXPECT_EQ(dev.journal(), per_volume({"LIB_Get_Disk_Size", "/mnt/HD/{}"}, c.disks)) << c.what;

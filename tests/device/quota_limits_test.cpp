@@ -13,7 +13,7 @@ const std::string kStore = "g\tHD_a2\tfamily\t102400\ng\tHD_b2\tfamily\t51200\ng
 
 void prepare(Device& dev, const std::string& table)
 {
-    set_volume_table(dev, table, true);
+    set_volume_table(dev, table);
     dev.write_file("/var/lib/platform/quota", kStore);
 }
 

@@ -41,7 +41,7 @@ TEST(SetQuota, AppliesEachVolumeOfTheTableInKilobytes)
     for (const auto& c : cases) {
         for (const std::string kind : {"User", "Group"}) {
             Device dev;
-            set_volume_table(dev, c.table, true);
+            set_volume_table(dev, c.table);
             const std::string cmd = kind == "User" ? "cgi_user_set_quota" : "cgi_group_set_quota";
             EXPECT_EQ(dev.request(cmd, quota_form("alice", c.available)), kEmptyHtml) << c.what;
             Journal expected;
@@ -90,7 +90,7 @@ TEST(SetQuota, TracesPathsAndSizes)
     };
     for (const auto& c : cases) {
         Device dev;
-        set_volume_table(dev, c.table, true);
+        set_volume_table(dev, c.table);
         dev.trace_on();
         EXPECT_EQ(dev.request(c.cmd, quota_form("alice", {"10", "null", "3"})), kEmptyHtml);
         EXPECT_EQ(dev.console(), c.console) << c.cmd;

@@ -57,7 +57,7 @@ TEST(UserAdd, CreatesTheUserWithAPrivateHomeShare)
     EXPECT_EQ(dev.read_file("/var/lib/platform/hints"), "dave\tusual\n");
     EXPECT_THAT(dev.read_file("/var/lib/platform/shares"),
                 testing::HasSubstr("\ndave\t/mnt/HD/HD_a2/dave\tno\tyes\t0\t0\t0\t1\tdave:2\n"));
-    EXPECT_EQ(resolved(dev, "/shares/dave"), "/mnt/HD/HD_a2/dave");
+    EXPECT_EQ(dev.run({"/usr/bin/realpath", "-e", "/shares/dave"}).out, "/mnt/HD/HD_a2/dave\n");
 }
 
 TEST(UserAdd, ChoosesLinesAndHomeShareByDialogAndVolumeTable)
