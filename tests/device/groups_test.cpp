@@ -56,12 +56,7 @@ TEST(GroupDel, DeletesEachListedGroupKeepingItsMembers)
 {
     const Journal family_office = concat({deletion_of("family", "family", "1004"), deletion_of("office", "family", "1005")});
     const std::vector<std::string> both{"SYSTEM: Group \"family\" has been deleted.", "SYSTEM: Group \"office\" has been deleted."};
-    const struct {
-        const char* what;
-        std::string list;
-        Journal deletions;
-        std::vector<std::string> events;
-    } cases[] = {
+    const struct { const char* what; std::string list; Journal deletions; std::vector<std::string> events; } cases[] = {
         {"two groups: the clean-up names the first twice", "family,office", family_office, both},
         {"empty items are skipped", "family,,office", family_office, both},
         {"one group", "family", deletion_of("family", "family", "1004"), {both[0]}},
@@ -141,11 +136,7 @@ TEST(GroupEditInfo, ShowsTheLimitsInMegabytes)
 
 TEST(GroupModify, ChangesQuotasMembersOrName)
 {
-    const struct {
-        const char* what;
-        Fields fields;
-        Journal journal;
-    } cases[] = {
+    const struct { const char* what; Fields fields; Journal journal; } cases[] = {
         {"1: limits on two internal volumes, the rest ignored",
          {{"mtype", "1"}, {"group", "family"}, {"available1", "2"}, {"available3", "9"}, {"available4", "9"}},
          {{"LIB_Set_Group_Quota", "HD_a2", "family", "2048"}, {"LIB_Set_Group_Quota", "HD_b2", "family", "0"}}},

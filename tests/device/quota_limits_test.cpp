@@ -26,11 +26,7 @@ std::string group_min_answer(const std::string& values)
 
 TEST(QuotaLimits, AddUserMaximumPerVolume)
 {
-    const struct {
-        const char* what;
-        std::string table, type, name, values;
-        Journal journal;
-    } cases[] = {
+    const struct { const char* what; std::string table, type, name, values; Journal journal; } cases[] = {
         {"plain: the name is a group's, other types are plain", kTwo, "x", "family", "102400:51200:0:0",
          per_volume({"LIB_Quota", "103", "{}", "family"}, 2)},
         {"plain, four volumes; only exactly ad is ad", kFour, "AD", "family", "102400:51200:3000:0",
@@ -58,11 +54,7 @@ TEST(QuotaLimits, AddUserMaximumPerVolume)
 
 TEST(QuotaLimits, AddGroupMinimumPerVolume)
 {
-    const struct {
-        const char* what;
-        std::string table, type, name, values;
-        Journal journal;
-    } cases[] = {
+    const struct { const char* what; std::string table, type, name, values; Journal journal; } cases[] = {
         {"plain: over the member list", kTwo, "x", "alice,bob,carol", "30720:9999:0:0",
          per_volume({"LIB_Get_Add_New_Group_Min_Quota", "{}", "alice,bob,carol"}, 2)},
         {"plain, four volumes", kFour, "", "bob", "30720:0:1500:0",
@@ -141,11 +133,7 @@ TEST(QuotaLimits, BoundOfOneVolumeByNumber)
 
 TEST(QuotaLimits, TraceTheQuestionAndTheAnswer)
 {
-    const struct {
-        const char* cmd;
-        Fields fields;
-        std::string console;
-    } cases[] = {
+    const struct { const char* cmd; Fields fields; std::string console; } cases[] = {
         {"cgi_adduser_get_user_quota_maxsize", {{"name", "family"}},
          "------get user max quota--------\nname=family\nmaxsize=102400:51200:0:0\n---------------------------\n"},
         {"cgi_get_user_quota_maxsize", {{"name", "bob"}, {"hdd", "2"}},

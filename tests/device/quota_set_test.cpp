@@ -78,11 +78,7 @@ TEST(SetQuota, StoresTheLimitsTheLibraryReadsBack)
 
 TEST(SetQuota, TracesPathsAndSizes)
 {
-    const struct {
-        const char* cmd;
-        std::string table;
-        std::string console;
-    } cases[] = {
+    const struct { const char* cmd; std::string table; std::string console; } cases[] = {
         {"cgi_user_set_quota", kTwo, "path1=HD_a2\npath2=HD_b2\nsize1=[10240]\nsize2=[0]\nsize3=[0]\nsize4=[0]\n"},
         {"cgi_user_set_quota", kOne, "path1=HD_a2\npath2=\nsize1=[10240]\nsize2=[0]\nsize3=[0]\nsize4=[0]\n"},
         {"cgi_group_set_quota", kTwo, "group=alice\navailable1=10\navailable2=null\nnew_path1=HD_a2\nnew_path2=HD_b2\n"},

@@ -28,12 +28,7 @@ std::string deleted(const std::string& name)
 TEST(UserDel, DeletesEachListedUser)
 {
     const Journal alice_bob = concat({deletion_of("alice", "alice"), deletion_of("bob", "alice")});
-    const struct {
-        const char* what;
-        std::string names;
-        Journal journal;
-        std::vector<std::string> events;
-    } cases[] = {
+    const struct { const char* what; std::string names; Journal journal; std::vector<std::string> events; } cases[] = {
         {"two users: the clean-up names alice twice", "alice,bob", around(alice_bob), {deleted("alice"), deleted("bob")}},
         {"a run of commas is one separator", "alice,,bob,", around(alice_bob), {deleted("alice"), deleted("bob")}},
         {"a leading comma stays at the buffer's start", ",alice", around(deletion_of("alice", ",alice")),

@@ -7,11 +7,7 @@
 TEST(UserEditInfo, ShowsLimitsPerInternalVolume)
 {
     const Journal disks = per_volume({"LIB_Get_Disk_Size", "/mnt/HD/{}"}, 2);
-    const struct {
-        const char* what;
-        std::string name, table, body;
-        Journal journal;
-    } cases[] = {
+    const struct { const char* what; std::string name, table, body; Journal journal; } cases[] = {
         {"limits in megabytes, rounded down", "alice", kUsbBetween,
          "<quota_info><v_name>Volume_1</v_name><quota>100</quota><max_quota>0</max_quota></quota_info>"
          "<quota_info><v_name>Volume_2</v_name><quota>0</quota><max_quota>0</max_quota></quota_info>"

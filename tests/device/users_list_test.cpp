@@ -55,12 +55,7 @@ TEST(UserList, PagesAndFiltersAsTheGridCounts)
     users30[4] = "xa";      // three of thirty match "x": items 5, 12 and 27
     users30[11] = "xb";
     users30[26] = "xc";
-    const struct {
-        const char* what;
-        std::vector<std::string> users;
-        Fields fields;
-        std::string body;
-    } cases[] = {
+    const struct { const char* what; std::vector<std::string> users; Fields fields; std::string body; } cases[] = {
         {"page 2 of 25", users25, {{"page", "2"}, {"rp", "10"}},
          rows(11, {users25.begin() + 10, users25.begin() + 20}, "2", 25)},
         {"page 1 waits for matches", users30, {{"page", "1"}, {"rp", "10"}, {"query", "x"}, {"qtype", "name"}},

@@ -19,11 +19,7 @@ Journal with_save(const Journal& journal)
 
 TEST(ModifyAccount, ChangesOnePropertyByType)
 {
-    const struct {
-        const char* what;
-        Fields fields;
-        Journal journal;
-    } cases[] = {
+    const struct { const char* what; Fields fields; Journal journal; } cases[] = {
         {"1: description", {{"mtype", "1"}, {"username", "alice"}, {"description", "Alice L."}, {"mail", "x"}},
          ran("account -m -u 'alice' -f 'Alice L.'")},
         {"2: e-mail", {{"mtype", "2"}, {"username", "alice"}, {"mail", "a@b.c"}}, ran("account -m -u 'alice' -e 'a@b.c'")},
@@ -80,11 +76,7 @@ TEST(ModifyAccount, TheAccountFilesChange)
 
 TEST(ModifyAccount, RenamesOnlyFromAnExistingUserAndFollowsUpOnSuccess)
 {
-    const struct {
-        const char* what;
-        std::string old_name, name;
-        Journal journal;
-    } cases[] = {
+    const struct { const char* what; std::string old_name, name; Journal journal; } cases[] = {
         {"renamed: the follow-ups run", "alice", "alicia",
          concat({ran("account -u 'alice' -n 'alicia'"),
                  {{"isoMount_user_rename", "alice", "alicia"}, {"change_user_group_name", "alice", "alicia"},
@@ -119,11 +111,7 @@ TEST(AdminPassword, ChangesOnlyWithTheOldPassword)
     ASSERT_NE(blanked, sent);
     // boss, a member of administrators, has the case's hash; "$2$" is the SHA-1 block route.
     const std::string sha1_block = "$2$8cd71d4ef7af97c0133d5d8e27b1628772a0031f";
-    const struct {
-        const char* what;
-        std::string user, hash, old_password, pw;
-        bool changed;
-    } cases[] = {
+    const struct { const char* what; std::string user, hash, old_password, pw; bool changed; } cases[] = {
         {"right old password", "admin", "", "admin", sent, true},
         {"a + that arrived as a blank", "admin", "", "admin", blanked, true},
         {"wrong old password", "admin", "", "Admin", sent, false},
