@@ -1,5 +1,4 @@
-// The quota bounds of the simulated quota library, on a small table of users, groups
-// and limits.
+// The quota bounds of the simulated quota library on a small table of limits.
 #include <gtest/gtest.h>
 
 #include "sim/lib/quota_bounds.h"
@@ -35,10 +34,8 @@ TEST(QuotaBounds, UserMaximumIsTheSmallestLimitOfItsGroups)
         {"HD_a2", "carol", 500},   // office
         {"HD_a2", "dave", 0},      // no limited group: no bound
         {"HD_b2", "alice", 2000},  // allaccount; family's 0 and office's -5 do not bound
-        {"HD_b2", "carol", 2000},
         {"HD_c2", "alice", 0},     // a volume without limits
-        {"HD_a2", "nobody", 0},    // not a member of anything
-        {"HD_a2", "", 0},
+        {"HD_a2", "", 0},          // not a member of anything
     };
     for (const auto& c : cases)
         EXPECT_EQ(max_user_quota(kMemberships, kLimits, c.dir, c.user), c.max) << c.dir << " " << c.user;
@@ -53,7 +50,6 @@ TEST(QuotaBounds, GroupMinimumIsTheLargestLimitOfItsMembers)
     } cases[] = {
         {"HD_a2", "family", 800},      // alice 300, bob 800
         {"HD_a2", "office", 300},      // carol none, alice 300
-        {"HD_a2", "allaccount", 800},
         {"HD_b2", "family", 0},        // bob's -1 is no bound
         {"HD_b2", "office", 700},      // carol
         {"HD_c2", "family", 0},
@@ -71,11 +67,10 @@ TEST(QuotaBounds, NewGroupMinimumIsOverTheSentMemberList)
         unsigned long long min;
     } cases[] = {
         {"HD_a2", "alice,bob", 800},
-        {"HD_a2", "alice", 300},
         {"HD_a2", " alice , carol ", 300},  // blanks around names are ignored
         {"HD_a2", ",,carol,", 0},           // empty names are skipped
         {"HD_b2", "bob,carol", 700},
-        {"HD_a2", "", 0},
+        {"HD_a2", "", 0},          // not a member of anything
         {"HD_a2", "alice bob", 0},          // one name "alice bob", which has no limit
     };
     for (const auto& c : cases)
