@@ -212,18 +212,34 @@ int modify_user(const Options& o)
     return 0;
 }
 
+// What a rename needs (`kind` is "user" or "group"): the entry OLD_NAME exists, and
+// NEW_NAME is valid and not taken. Returns OLD_NAME's row, or nullptr after the
+// failure message.
+ColonRow* entry_to_rename(ColonFile& file, const std::string& kind, const std::string& old_name,
+                          const std::string& new_name)
+{
+    const auto refused = [](const std::string& message) -> ColonRow* {
+        fail(message);
+        return nullptr;
+    };
+    ColonRow* entry = file.find(old_name);
+    if (!entry)
+        return refused(kind + " '" + old_name + "' does not exist");
+    if (!valid_name(new_name))
+        return refused("invalid " + kind + " name '" + new_name + "'");
+    if (file.find(new_name))
+        return refused(kind + " '" + new_name + "' already exists");
+    return entry;
+}
+
 int rename_user(const std::string& old_name, const std::string& new_name)
 {
     ColonFile passwd = ColonFile::load(kPasswdFile);
     ColonFile shadow = ColonFile::load(kShadowFile);
     ColonFile groups = ColonFile::load(kGroupFile);
-    ColonRow* user = passwd.find(old_name);
+    ColonRow* user = entry_to_rename(passwd, "user", old_name, new_name);
     if (!user)
-        return fail("user '" + old_name + "' does not exist");
-    if (!valid_name(new_name))
-        return fail("invalid user name '" + new_name + "'");
-    if (passwd.find(new_name))
-        return fail("user '" + new_name + "' already exists");
+        return 1;
     (*user)[0] = new_name;
     if (ColonRow* row = shadow.find(old_name))
         (*row)[0] = new_name;
@@ -281,13 +297,9 @@ int set_group_member_list(const std::string& name, const std::string& list)
 int rename_group(const std::string& old_name, const std::string& new_name)
 {
     ColonFile groups = ColonFile::load(kGroupFile);
-    ColonRow* group = groups.find(old_name);
+    ColonRow* group = entry_to_rename(groups, "group", old_name, new_name);
     if (!group)
-        return fail("group '" + old_name + "' does not exist");
-    if (!valid_name(new_name))
-        return fail("invalid group name '" + new_name + "'");
-    if (groups.find(new_name))
-        return fail("group '" + new_name + "' already exists");
+        return 1;
     (*group)[0] = new_name;
     if (!groups.save())
         return fail("cannot write the account files");

@@ -22,11 +22,26 @@ int usage(const char* tool)
     return 2;
 }
 
+// Each tool is used in one form only: TOOL OPTION ARGUMENT ARGUMENT.
+bool has_form(int argc, char** argv, const char* option)
+{
+    return argc == 4 && std::strcmp(argv[1], option) == 0;
+}
+
+// USER's entry in the passwd file, or nullptr after the tool's message.
+ColonRow* existing_user(ColonFile& passwd, const char* tool, const std::string& user)
+{
+    ColonRow* entry = passwd.find(user);
+    if (!entry)
+        std::fprintf(stderr, "%s: user '%s' does not exist\n", tool, user.c_str());
+    return entry;
+}
+
 } // namespace
 
 int tool_gpasswd(int argc, char** argv)
 {
-    if (argc != 4 || std::strcmp(argv[1], "-d") != 0)
+    if (!has_form(argc, argv, "-d"))
         return usage("gpasswd");
     const std::string user = argv[2];
     const std::string name = argv[3];
@@ -48,7 +63,7 @@ int tool_gpasswd(int argc, char** argv)
 
 int tool_usermod(int argc, char** argv)
 {
-    if (argc != 4 || std::strcmp(argv[1], "-g") != 0)
+    if (!has_form(argc, argv, "-g"))
         return usage("usermod");
     const std::string wanted = argv[2];
     const std::string user = argv[3];
@@ -65,18 +80,16 @@ int tool_usermod(int argc, char** argv)
         return 6;
     }
     ColonFile passwd = ColonFile::load(kPasswdFile);
-    ColonRow* entry = passwd.find(user);
-    if (!entry) {
-        std::fprintf(stderr, "usermod: user '%s' does not exist\n", user.c_str());
+    ColonRow* entry = existing_user(passwd, "usermod", user);
+    if (!entry)
         return 6;
-    }
     set_field(*entry, 3, gid);
     return passwd.save() ? 0 : 1;
 }
 
 int tool_chfn(int argc, char** argv)
 {
-    if (argc != 4 || std::strcmp(argv[1], "-o") != 0)
+    if (!has_form(argc, argv, "-o"))
         return usage("chfn");
     const std::string other = argv[2];
     const std::string user = argv[3];
@@ -85,11 +98,9 @@ int tool_chfn(int argc, char** argv)
         return 1;
     }
     ColonFile passwd = ColonFile::load(kPasswdFile);
-    ColonRow* entry = passwd.find(user);
-    if (!entry) {
-        std::fprintf(stderr, "chfn: user '%s' does not exist\n", user.c_str());
+    ColonRow* entry = existing_user(passwd, "chfn", user);
+    if (!entry)
         return 1;
-    }
     set_gecos_field(*entry, kGecosOther, other);
     return passwd.save() ? 0 : 1;
 }

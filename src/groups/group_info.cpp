@@ -1,14 +1,10 @@
 // What the new-group and edit-group pages show: the volumes and the group's limits.
-#include <cstdio>
-#include <cstring>
-
-#include "cgi/file.h"
 #include "cgi/fixed_text.h"
 #include "cgi/form.h"
 #include "cgi/handlers.h"
 #include "cgi/response.h"
 #include "platform/quota.h"
-#include "users/account_volumes.h"
+#include "volumes/internal_volumes.h"
 #include "volumes/volume_table.h"
 
 namespace {
@@ -29,7 +25,9 @@ void cgi_get_group_info()
     write_xml_header(Charset::Plain);
     write_xml_prologue();
     out("<group_info>");
-    for_each_internal_volume([](const char* volume, const char*) { out("<v_name>%s</v_name>", volume); });
+    // A blank table line repeats the volume name before it: the buffers are cleared once.
+    for_each_internal_volume([](const VolumeLine& volume) { out("<v_name>%s</v_name>", volume.name.c_str()); },
+                             SplitBuffers::ClearedOnce);
     write_volume_count_and_sizes();
     out("</group_info>");
 }
@@ -45,14 +43,16 @@ void cgi_get_modify_group_info()
     write_xml_prologue();
     out("<group_info>");
     write_volume_count_and_sizes();
-    for_each_internal_volume([&](const char* volume, const char* device_dir) {
-        unsigned long long limit = 0;
-        unsigned long long other = 0;
-        LIB_Quota(103, device_dir, group.c_str(), &limit, &other);
-        out("<quota>");
-        out("<v_name>%s</v_name>", volume);
-        out("<size>%lld</size>", static_cast<long long>(limit >> 10));
-        out("</quota>");
-    });
+    for_each_internal_volume(
+        [&](const VolumeLine& volume) {
+            unsigned long long limit = 0;
+            unsigned long long other = 0;
+            LIB_Quota(103, volume.device_dir.c_str(), group.c_str(), &limit, &other);
+            out("<quota>");
+            out("<v_name>%s</v_name>", volume.name.c_str());
+            out("<size>%lld</size>", static_cast<long long>(limit >> 10));
+            out("</quota>");
+        },
+        SplitBuffers::ClearedOnce);
     out("</group_info>");
 }

@@ -12,7 +12,7 @@
 #include "platform/ftp.h"
 #include "platform/quota.h"
 #include "platform/share.h"
-#include "users/account_volumes.h"
+#include "volumes/internal_volumes.h"
 
 namespace {
 

@@ -2,7 +2,6 @@
 // The page sends whole megabytes per volume; the quota library takes kilobytes. The
 // bounds the pages show beside the boxes are not checked here.
 #include <array>
-#include <cstdlib>
 
 #include "cgi/form.h"
 #include "cgi/handlers.h"
@@ -15,24 +14,12 @@ namespace {
 
 enum class Owner { User, Group };
 
-// Megabytes as the page sends them, in kilobytes: the base-10 value of the text,
-// shifted left by 10 bits as a signed 64-bit number. Trailing text is ignored ("100MB"
-// is 100), text without leading digits is 0, and a negative value stays negative.
-long long kilobytes_from_megabytes(const char* megabytes)
-{
-    const long long value = std::strtoll(megabytes, nullptr, 10);
-    // Shifted as the bits of the signed value: out-of-range values wrap, never trap.
-    return static_cast<long long>(static_cast<unsigned long long>(value) << 10);
-}
-
 // The one procedure behind both commands; they differ in the library call and the
 // trace lines.
 void set_quota(Owner owner)
 {
     const auto name = form_value<64>("name");
-    const std::array<FixedText<64>, kQuotaVolumes> available{
-        form_value<64>("available1"), form_value<64>("available2"),
-        form_value<64>("available3"), form_value<64>("available4")};
+    const VolumeLimitFields available = read_volume_limit_fields();
 
     const VolumePaths paths = map_internal_volume_paths();
 

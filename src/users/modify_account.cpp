@@ -16,9 +16,9 @@
 #include "platform/quota.h"
 #include "platform/share.h"
 #include "platform/storage.h"
-#include "users/account_volumes.h"
 #include "users/admin_password.h"
 #include "volumes/helpers.h"
+#include "volumes/internal_volumes.h"
 
 namespace {
 

@@ -7,7 +7,7 @@
 #include "cgi/response.h"
 #include "platform/quota.h"
 #include "platform/share.h"
-#include "users/account_volumes.h"
+#include "volumes/internal_volumes.h"
 #include "volumes/volume_table.h"
 
 // The user's quota and largest allowed quota on each internal volume, the volumes'
@@ -31,17 +31,21 @@ void cgi_get_modify_user_info()
         return;
     }
 
-    for_each_internal_volume([&](const char* volume, const char* device_dir) {
-        unsigned long long limit = 0;
-        unsigned long long used = 0;
-        LIB_Quota(117, device_dir, name.c_str(), &limit, &used);
-        const unsigned long long max_quota = Lib_Gen_Get_Max_User_Quota(device_dir, name.c_str());
-        out("<quota_info>");
-        out("<v_name>%s</v_name>", volume);
-        out("<quota>%lld</quota>", static_cast<long long>(limit >> 10));
-        out("<max_quota>%lld</max_quota>", static_cast<long long>(max_quota >> 10));
-        out("</quota_info>");
-    });
+    // A blank table line repeats the volume before it: the buffers are cleared once.
+    for_each_internal_volume(
+        [&](const VolumeLine& volume) {
+            const char* device_dir = volume.device_dir.c_str();
+            unsigned long long limit = 0;
+            unsigned long long used = 0;
+            LIB_Quota(117, device_dir, name.c_str(), &limit, &used);
+            const unsigned long long max_quota = Lib_Gen_Get_Max_User_Quota(device_dir, name.c_str());
+            out("<quota_info>");
+            out("<v_name>%s</v_name>", volume.name.c_str());
+            out("<quota>%lld</quota>", static_cast<long long>(limit >> 10));
+            out("<max_quota>%lld</max_quota>", static_cast<long long>(max_quota >> 10));
+            out("</quota_info>");
+        },
+        SplitBuffers::ClearedOnce);
 
     out("<hddnum>%d</hddnum>", volumes);
     out("<hddsize>%s</hddsize>", sizes.c_str());

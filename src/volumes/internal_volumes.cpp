@@ -1,9 +1,11 @@
 #include "volumes/internal_volumes.h"
 
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
 
 #include "cgi/file.h"
+#include "cgi/form.h"
 #include "volumes/volume_table.h"
 
 bool for_each_internal_volume(const std::function<void(const VolumeLine&)>& visit, SplitBuffers buffers)
@@ -37,4 +39,28 @@ VolumePaths map_internal_volume_paths()
             resolve_volume_path(volume.name.c_str(), paths[volume.number - 1], 1);
     });
     return paths;
+}
+
+long long kilobytes_from_megabytes(const char* megabytes)
+{
+    const long long value = std::strtoll(megabytes, nullptr, 10);
+    // Shifted as the bits of the signed value: out-of-range values wrap, never trap.
+    return static_cast<long long>(static_cast<unsigned long long>(value) << 10);
+}
+
+VolumeLimitFields read_volume_limit_fields()
+{
+    return {form_value<64>("available1"), form_value<64>("available2"), form_value<64>("available3"),
+            form_value<64>("available4")};
+}
+
+void set_internal_volume_limits(const char* name, const VolumeLimitFields& available, SetQuotaLimit set_limit)
+{
+    for_each_internal_volume(
+        [&](const VolumeLine& volume) {
+            if (volume.number <= kQuotaVolumes)
+                set_limit(volume.device_dir.c_str(), name,
+                          kilobytes_from_megabytes(available[volume.number - 1].c_str()));
+        },
+        SplitBuffers::ClearedOnce);
 }
