@@ -75,6 +75,13 @@ void parse_request(const CgiEnvironment& environment, std::istream& body)
     request_fields() = std::move(fields);
 }
 
+void parse_request(const CgiEnvironment& environment)
+{
+    FormFields fields;
+    parse_urlencoded(environment.query_string, fields);
+    request_fields() = std::move(fields);
+}
+
 FormField* find_field(std::string_view name)
 {
     for (FormField& field : request_fields()) {

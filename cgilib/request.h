@@ -54,6 +54,8 @@ CgiEnvironment environment_from_process();
 // A body that ends before CONTENT_LENGTH bytes (a multipart one: before its closing
 // delimiter) is dropped whole: a cut request must not act on a cut value.
 void parse_request(const CgiEnvironment& environment, std::istream& body);
+// The same for a request without a body to read (anything but a POST).
+void parse_request(const CgiEnvironment& environment);
 
 // The first field called `name`, or nullptr.
 FormField* find_field(std::string_view name);
