@@ -6,6 +6,7 @@
 // The volumes are the lines of /etc/shared_name whose volume name does not hold
 // "USB"; the limit is written to the quota store (sim/lib/quota_store.h) in
 // kilobytes, so the quota library reads it back. 0 removes the limit.
+#include <array>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
@@ -26,11 +27,12 @@ int tool_quota_set(int argc, char** argv)
     const std::string name = argv[2];
     const long long limit_kb = std::strtoll(argv[4], nullptr, 10) * 1024;
     for (const std::string& line : read_lines("/etc/shared_name")) {
-        char volume[64] = {};
-        char device_dir[16] = {};
-        if (std::sscanf(line.c_str(), "%63s = %15s", volume, device_dir) != 2 || std::strstr(volume, "USB"))
+        std::array<char, 64> volume{};
+        std::array<char, 16> device_dir{};
+        if (std::sscanf(line.c_str(), "%63s = %15s", volume.data(), device_dir.data()) != 2
+            || std::strstr(volume.data(), "USB"))
             continue;
-        set_quota_limit(kind, device_dir, name, limit_kb);
+        set_quota_limit(kind, device_dir.data(), name, limit_kb);
     }
     return 0;
 }
