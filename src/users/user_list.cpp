@@ -15,7 +15,7 @@
 #include "cgi/trace.h"
 #include "platform/config_store.h"
 #include "platform/share.h"
-#include "users/password_entries.h"
+#include "volumes/password_entries.h"
 #include "volumes/helpers.h"
 #include "volumes/reserved_accounts.h"
 #include "volumes/volume_table.h"

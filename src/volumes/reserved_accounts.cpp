@@ -5,7 +5,7 @@
 #include <pwd.h>
 #include <string_view>
 
-#include "cgi/file.h"
+#include "volumes/password_entries.h"
 
 namespace {
 
@@ -40,16 +40,10 @@ bool is_reserved_group(const char* name)
 int count_listed_users()
 {
     int count = 0;
-    const UniqueFile users = open_file("/etc/passwd", "r");
-    if (users) {
-        // A seek to the start lets the stream know its offset; the entry reader asks
-        // for it before every entry, and would otherwise ask the kernel each time.
-        std::fseek(users.get(), 0, SEEK_SET);
-        while (const passwd* entry = fgetpwent(users.get())) {
-            if (!is_reserved_user(entry->pw_name))
-                ++count;
-        }
-    }
+    for_each_password_entry("/etc/passwd", [&](const passwd& entry) {
+        if (!is_reserved_user(entry.pw_name))
+            ++count;
+    });
     endpwent();
     return count;
 }
