@@ -19,13 +19,16 @@ build: setup
 	@cmake -S . -B $(BUILD) -DCMAKE_BUILD_TYPE=RelWithDebInfo >/dev/null
 	@cmake --build $(BUILD) -j$(JOBS)
 
+# A test that fails is run once more; its first failure stays in the output.
+CTEST = ctest -j$(JOBS) --output-on-failure --repeat until-pass:2
+
 test: build
-	@cd $(BUILD) && ctest -j$(JOBS) --output-on-failure
+	@cd $(BUILD) && $(CTEST)
 
 test-asan: setup
 	@cmake -S . -B $(ASAN_BUILD) -DCMAKE_BUILD_TYPE=Debug -DNAS_SANITIZE=ON >/dev/null
 	@cmake --build $(ASAN_BUILD) -j$(JOBS)
-	@cd $(ASAN_BUILD) && ctest -j$(JOBS) --output-on-failure
+	@cd $(ASAN_BUILD) && $(CTEST)
 
 bench: build
 	@NAS_BUILD=$(abspath $(BUILD)) bench/run
