@@ -3,7 +3,7 @@
 
 bool is_acceptable_name(std::string_view name)
 {
-    if (name.empty() || name == "." || name == ".." || name.front() == '-')
+    if (name == "." || name == ".." || (!name.empty() && name.front() == '-'))
         return false;
     for (const unsigned char c : name) {
         if (c < 0x20 || c == 0x7f || c == '/')
