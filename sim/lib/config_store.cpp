@@ -1,20 +1,39 @@
 // The config store over "/etc/NAS_CFG/config.xml". The file is parsed at most once
 // per process; changes stay in the loaded document until xml_write_file saves it.
 // Reads are not events of the device; changes are recorded in the journal.
+//
+// Two requests may change different keys at the same time. So a change is also kept
+// in this process's list of changes, and xml_write_file takes the store's lock, loads
+// the file as it is now, applies this process's changes to it in their order, and
+// replaces the file atomically before it lets the lock go: a key another request
+// stored meanwhile is kept, and readers see the old or the new file, never a part.
 #include "platform/config_store.h"
 
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
 #include <pugixml.hpp>
+#include <sstream>
 #include <string>
 #include <string_view>
+#include <utility>
+#include <vector>
 
+#include "cgi/atomic_file.h"
+#include "cgi/file_lock.h"
 #include "journal.h"
 
 namespace {
 
 constexpr const char* kConfigFile = "/etc/NAS_CFG/config.xml";
+
+void load(pugi::xml_document& doc, const char* file)
+{
+    if (!doc.load_file(file))
+        doc.reset();
+    if (!doc.document_element())
+        doc.append_child("config");
+}
 
 pugi::xml_document& document()
 {
@@ -22,12 +41,16 @@ pugi::xml_document& document()
     static bool loaded = false;
     if (!loaded) {
         loaded = true;
-        if (!doc.load_file(kConfigFile))
-            doc.reset();
-        if (!doc.document_element())
-            doc.append_child("config");
+        load(doc, kConfigFile);
     }
     return doc;
+}
+
+// The keys this process set since its last save, with their values, in order.
+std::vector<std::pair<std::string, std::string>>& changes()
+{
+    static std::vector<std::pair<std::string, std::string>> list;
+    return list;
 }
 
 // The element at a slash path below the root element, or an empty node.
@@ -48,9 +71,9 @@ pugi::xml_node find_key(const char* path)
     return node;
 }
 
-pugi::xml_node find_or_create_key(const char* path)
+pugi::xml_node find_or_create_key(pugi::xml_document& doc, const char* path)
 {
-    pugi::xml_node node = document().document_element();
+    pugi::xml_node node = doc.document_element();
     std::string_view rest(path);
     while (!rest.empty()) {
         if (rest.front() == '/') {
@@ -97,13 +120,26 @@ extern "C" int xml_get_int(const char* path)
 extern "C" int xml_set_str(const char* path, const char* value)
 {
     journal_record("xml_set_str", {path, value});
-    pugi::xml_node key = find_or_create_key(path);
-    key.text().set(value);
+    find_or_create_key(document(), path).text().set(value);
+    changes().emplace_back(path, value);
     return 0;
 }
 
 extern "C" int xml_write_file(const char* file)
 {
     journal_record("xml_write_file", {file});
-    return document().save_file(file, "\t") ? 0 : -1;
+    const auto lock = FileLock::acquire("config");
+    if (!lock)
+        return -1;
+    pugi::xml_document current;
+    load(current, file);
+    for (const auto& [path, value] : changes())
+        find_or_create_key(current, path.c_str()).text().set(value.c_str());
+    std::ostringstream text;
+    current.save(text, "\t");
+    if (!replace_file(file, text.str()))
+        return -1;
+    document().reset(current);
+    changes().clear();
+    return 0;
 }

@@ -14,6 +14,7 @@
 #include <string>
 
 #include "account_files.h"
+#include "cgi/file_lock.h"
 #include "journal.h"
 #include "quota_store.h"
 
@@ -41,6 +42,9 @@ extern "C" int LIB_Set_Group_Quota(const char* device_dir, const char* group, lo
 extern "C" int LIB_Compare_User_and_Group_Quota(const char* user, const char* group)
 {
     journal_record("LIB_Compare_User_and_Group_Quota", {user, group});
+    const auto lock = FileLock::acquire("quota");
+    if (!lock)
+        return -1;
     std::vector<QuotaLimit> limits = load_quota_limits();
     for (const QuotaLimit& bound : load_quota_limits()) {
         if (bound.kind != 'g' || bound.name != group || bound.limit_kb <= 0)
@@ -62,6 +66,9 @@ extern "C" int LIB_Compare_User_and_Group_Quota(const char* user, const char* gr
 extern "C" int LIB_Rejoin_Other_Group_Quota(void)
 {
     journal_record("LIB_Rejoin_Other_Group_Quota", {});
+    const auto lock = FileLock::acquire("quota");
+    if (!lock)
+        return -1;
     const ColonFile groups = ColonFile::load(kGroupFile);
     std::vector<QuotaLimit> limits = load_quota_limits();
     std::erase_if(limits, [&](const QuotaLimit& limit) { return limit.kind == 'g' && !groups.find(limit.name); });

@@ -2,6 +2,7 @@
 
 #include <cstdlib>
 
+#include "cgi/file_lock.h"
 #include "text_file.h"
 
 std::vector<QuotaLimit> load_quota_limits()
@@ -38,6 +39,9 @@ long long quota_limit(char kind, std::string_view device_dir, std::string_view n
 
 bool set_quota_limit(char kind, std::string_view device_dir, std::string_view name, long long limit_kb)
 {
+    const auto lock = FileLock::acquire("quota");
+    if (!lock)
+        return false;
     std::vector<QuotaLimit> limits = load_quota_limits();
     bool found = false;
     for (QuotaLimit& limit : limits) {
@@ -53,6 +57,9 @@ bool set_quota_limit(char kind, std::string_view device_dir, std::string_view na
 
 bool rename_quota_owner(char kind, std::string_view old_name, std::string_view new_name)
 {
+    const auto lock = FileLock::acquire("quota");
+    if (!lock)
+        return false;
     std::vector<QuotaLimit> limits = load_quota_limits();
     for (QuotaLimit& limit : limits) {
         if (limit.kind == kind && limit.name == old_name)

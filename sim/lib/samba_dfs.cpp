@@ -21,6 +21,7 @@
 #include <string_view>
 #include <vector>
 
+#include "cgi/file_lock.h"
 #include "dfs_store.h"
 #include "journal.h"
 
@@ -86,6 +87,9 @@ extern "C" int create_dfs_link(void)
 extern "C" int add_dfs_node(const char* host, const char* path, const char* sharename, const char* group)
 {
     journal_record("add_dfs_node", {host, path, sharename, group});
+    const auto lock = FileLock::acquire("dfs");
+    if (!lock)
+        return kRefused;
     std::vector<DfsLink> links = load_dfs_links();
     if (!storable(host) || !storable(path) || !storable(sharename) || !storable(group)
         || find_link(links, sharename, group) != links.end())
@@ -98,6 +102,9 @@ extern "C" int mod_dfs_node(const char* host, const char* path, const char* shar
                             const char* old_share, const char* old_group)
 {
     journal_record("mod_dfs_node", {host, path, sharename, group, old_share, old_group});
+    const auto lock = FileLock::acquire("dfs");
+    if (!lock)
+        return kRefused;
     std::vector<DfsLink> links = load_dfs_links();
     const auto link = find_link(links, old_share, old_group);
     if (link == links.end() || !storable(host) || !storable(path) || !storable(sharename) || !storable(group))
@@ -113,6 +120,9 @@ extern "C" int mod_dfs_node(const char* host, const char* path, const char* shar
 extern "C" int del_dfs_node(const char* local, const char* group)
 {
     journal_record("del_dfs_node", {local, group});
+    const auto lock = FileLock::acquire("dfs");
+    if (!lock)
+        return kRefused;
     std::vector<DfsLink> links = load_dfs_links();
     const auto link = find_link(links, local, group);
     if (link == links.end())
@@ -152,6 +162,9 @@ extern "C" int get_dfs_info(void)
 extern "C" int add_dfs_group_node(const char* group)
 {
     journal_record("add_dfs_group_node", {group});
+    const auto lock = FileLock::acquire("dfs");
+    if (!lock)
+        return kRefused;
     std::vector<std::string> groups = load_dfs_groups();
     if (!storable(group) || std::find(groups.begin(), groups.end(), group) != groups.end())
         return kRefused;
@@ -163,6 +176,9 @@ extern "C" int add_dfs_group_node(const char* group)
 extern "C" int mod_dfs_group_node(const char* old_group, const char* group)
 {
     journal_record("mod_dfs_group_node", {old_group, group});
+    const auto lock = FileLock::acquire("dfs");
+    if (!lock)
+        return kRefused;
     std::vector<std::string> groups = load_dfs_groups();
     const auto old_entry = std::find(groups.begin(), groups.end(), old_group);
     if (old_entry == groups.end() || !storable(group)

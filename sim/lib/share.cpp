@@ -24,6 +24,7 @@
 // Each call records itself in the journal first; the list helpers and remove_0D_0A,
 // which touch no store, do not.
 #include "platform/share.h"
+#include "cgi/file_lock.h"
 
 #include <cstdlib>
 #include <cstring>
@@ -68,6 +69,9 @@ void copy_cut(char* buffer, const std::string& text, std::size_t size)
 extern "C" int set_default_deny(const char* name)
 {
     journal_record("set_default_deny", {name});
+    const auto lock = FileLock::acquire("shares");
+    if (!lock)
+        return -1;
     std::vector<ShareEntry> shares = load_shares();
     for (ShareEntry& share : shares) {
         bool listed = false;
@@ -91,6 +95,9 @@ extern "C" int add_share(const struct share_record* share)
     journal_record("add_share", {share->name, share->path, share->read_only, share->browseable,
                                  std::to_string(share->recycle_bin), std::to_string(share->public_access),
                                  std::to_string(share->media_serving), std::to_string(share->remote_access)});
+    const auto lock = FileLock::acquire("shares");
+    if (!lock)
+        return -1;
     std::vector<ShareEntry> shares = load_shares();
     if (share->name[0] == '\0' || find_share(shares, share->name))
         return -1;
@@ -106,6 +113,9 @@ extern "C" int add_share(const struct share_record* share)
 extern "C" int public_off_share(const char* name)
 {
     journal_record("public_off_share", {name});
+    const auto lock = FileLock::acquire("shares");
+    if (!lock)
+        return -1;
     std::vector<ShareEntry> shares = load_shares();
     ShareEntry* share = find_share(shares, name);
     if (!share)
@@ -134,6 +144,9 @@ extern "C" int insert_acnt_node(struct acnt_list* list, const char* name, int ac
 extern "C" int acnt_mod_share(const struct acnt_list* list, int mode)
 {
     journal_record("acnt_mod_share", {list->share, std::to_string(mode)});
+    const auto lock = FileLock::acquire("shares");
+    if (!lock)
+        return -1;
     std::vector<ShareEntry> shares = load_shares();
     ShareEntry* share = find_share(shares, list->share);
     if (!share)
@@ -157,6 +170,9 @@ extern "C" void free_acnt_list(struct acnt_list* list)
 extern "C" int del_share(const char* name)
 {
     journal_record("del_share", {name});
+    const auto lock = FileLock::acquire("shares");
+    if (!lock)
+        return -1;
     std::vector<ShareEntry> shares = load_shares();
     std::erase_if(shares, [name](const ShareEntry& share) { return share.name == name; });
     save_shares(shares);
@@ -167,6 +183,9 @@ extern "C" int del_share(const char* name)
 extern "C" int delete_user_group_name(const char* name)
 {
     journal_record("delete_user_group_name", {name});
+    const auto lock = FileLock::acquire("shares");
+    if (!lock)
+        return -1;
     const std::string group = std::string("@") + name;
     std::vector<ShareEntry> shares = load_shares();
     for (ShareEntry& share : shares)
@@ -177,6 +196,9 @@ extern "C" int delete_user_group_name(const char* name)
 extern "C" int change_user_group_name(const char* old_name, const char* new_name)
 {
     journal_record("change_user_group_name", {old_name, new_name});
+    const auto lock = FileLock::acquire("shares");
+    if (!lock)
+        return -1;
     const std::string old_group = std::string("@") + old_name;
     std::vector<ShareEntry> shares = load_shares();
     for (ShareEntry& share : shares) {

@@ -13,6 +13,7 @@
 #include <filesystem>
 #include <string>
 
+#include "cgi/atomic_file.h"
 #include "journal.h"
 
 namespace fs = std::filesystem;
@@ -56,6 +57,9 @@ extern "C" int saveDataToHiddenByVolume(const char* file, const char* volume)
     fs::create_directories(fs::path(target).parent_path(), failed);
     if (failed)
         return -1;
-    fs::copy_file(file, target, fs::copy_options::overwrite_existing, failed);
-    return failed ? -1 : 0;
+    // The volume's copy is replaced at once: a reader sees the old or the new rules.
+    std::string content;
+    if (!read_whole_file(file, content))
+        return -1;
+    return replace_file(target, content) ? 0 : -1;
 }

@@ -1,8 +1,8 @@
 #include "text_file.h"
 
-#include <cstdio>
 #include <fstream>
-#include <unistd.h>
+
+#include "cgi/atomic_file.h"
 
 std::vector<std::string> read_lines(const std::string& path)
 {
@@ -19,15 +19,12 @@ std::vector<std::string> read_lines(const std::string& path)
 
 bool write_lines(const std::string& path, const std::vector<std::string>& lines)
 {
-    const std::string temporary = path + ".new." + std::to_string(getpid());
-    {
-        std::ofstream out(temporary, std::ios::trunc);
-        for (const std::string& line : lines)
-            out << line << '\n';
-        if (!out)
-            return false;
+    std::string content;
+    for (const std::string& line : lines) {
+        content += line;
+        content += '\n';
     }
-    return std::rename(temporary.c_str(), path.c_str()) == 0;
+    return replace_file(path, content);
 }
 
 std::vector<std::string> split(std::string_view text, char separator)

@@ -8,8 +8,9 @@
 
 // The file's lines without their line ends; empty when the file is missing.
 std::vector<std::string> read_lines(const std::string& path);
-// Replaces the file with these lines, each ending in LF (written to a temporary file
-// beside it, then renamed over it). Returns false when it cannot be written.
+// Replaces the file with these lines, each ending in LF, atomically (replace_file in
+// cgi/atomic_file.h): on failure the old file stays as it was. The caller holds the
+// file's lock when it read the lines it now writes back.
 bool write_lines(const std::string& path, const std::vector<std::string>& lines);
 // Splits at every `separator`; "a\t\tb" gives three fields.
 std::vector<std::string> split(std::string_view text, char separator);

@@ -35,6 +35,7 @@
 #include <vector>
 
 #include "account_ops.h"
+#include "cgi/file_lock.h"
 #include "sim/lib/account_files.h"
 #include "sim/lib/quota_store.h"
 #include "sim/lib/text_file.h"
@@ -374,6 +375,10 @@ int tool_account(int argc, char** argv)
 {
     if (argc == 1)
         return 0;   // the re-sync of the platform's own account caches: nothing to do here
+    // The account files are read, changed and written under their lock.
+    const auto lock = FileLock::acquire("accounts");
+    if (!lock)
+        return fail("the account files are busy");
     const std::optional<Options> parsed = parse(argc, argv);
     if (!parsed)
         return 2;

@@ -23,6 +23,14 @@
 // and only then removes the marker. An account that exists is never changed, whatever
 // OVERWRITE says. APP is accepted and not used.
 //
+// A batch or an import may be started while an earlier run still works. The program
+// replaces a record file atomically under the file's lock, and a run reads its whole
+// record file at once under the same lock (shared), before anything else: a new file
+// never changes what a run in progress creates. Runs do not overlap: a later run waits
+// for the earlier one to finish (the "account_mgr" lock) before it sets its marker and
+// starts, so the status report answers "busy" (-1) until the last run is done, and the
+// status file it reads is always one run's whole result.
+//
 // "/sim/account_mgr.conf" slows a run down so that its progress can be watched
 // (KEY=VALUE lines, "#" starts a comment; a missing file means neither):
 //     delay_ms=N     pause N milliseconds before each account
@@ -33,11 +41,13 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <optional>
 #include <string>
 #include <thread>
 #include <vector>
 
 #include "account_ops.h"
+#include "cgi/file_lock.h"
 #include "sim/lib/text_file.h"
 #include "tools.h"
 
@@ -81,6 +91,13 @@ std::vector<std::vector<std::string>> load_records(const std::string& path)
     return records;
 }
 
+// The name of a record file's lock: its base name ("account_batch_info").
+std::string lock_name(const std::string& path)
+{
+    const auto slash = path.rfind('/');
+    return slash == std::string::npos ? path : path.substr(slash + 1);
+}
+
 std::string column(const std::vector<std::string>& record, std::size_t index)
 {
     return index < record.size() ? record[index] : "";
@@ -115,6 +132,18 @@ int tool_account_mgr(int argc, char** argv)
     if (users == groups || file.empty())
         return usage();
 
+    std::vector<std::vector<std::string>> records;
+    {
+        const auto lock = FileLock::acquire(lock_name(file), FileLock::Mode::shared);
+        if (!lock)
+            return 1;
+        records = load_records(file);
+    }
+    // A run in progress may take long (a big import): the wait is not bounded here.
+    const auto run = FileLock::acquire("account_mgr", FileLock::Mode::exclusive, std::chrono::hours(24));
+    if (!run)
+        return 1;
+
     const char* marker = users ? "/tmp/start_create_users" : "/tmp/start_create_groups";
     if (FILE* created = std::fopen(marker, "w"))
         std::fclose(created);
@@ -122,11 +151,14 @@ int tool_account_mgr(int argc, char** argv)
     const Pace pace = load_pace();
     wait_for_gate(pace.gate);
     std::vector<std::string> status;
-    for (const std::vector<std::string>& record : load_records(file)) {
+    for (const std::vector<std::string>& record : records) {
         std::this_thread::sleep_for(std::chrono::milliseconds(pace.delay_ms));
         const std::string name = column(record, 0);
-        const int result = users ? create_user({name, column(record, 1), column(record, 2), "", "", ""})
-                                 : create_group(name, column(record, 1));
+        int result = 1;
+        if (const auto accounts = FileLock::acquire("accounts")) {
+            result = users ? create_user({name, column(record, 1), column(record, 2), "", "", ""})
+                           : create_group(name, column(record, 1));
+        }
         status.push_back(name + ":" + (result == 0 ? "0" : "1"));
     }
     write_lines(kStatusFile, status);

@@ -17,6 +17,7 @@
 #include <sys/stat.h>
 #include <vector>
 
+#include "cgi/file_lock.h"
 #include "sim/lib/text_file.h"
 #include "tools.h"
 
@@ -82,6 +83,9 @@ std::vector<std::string> stored_entries(const std::string& folder)
 
 void store_entries(const std::string& folder, const std::vector<std::string>& entries)
 {
+    const auto lock = FileLock::acquire("acl");
+    if (!lock)
+        return;
     std::vector<std::string> lines;
     bool replaced = false;
     for (const std::string& line : read_lines(kAclStore)) {

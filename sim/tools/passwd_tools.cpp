@@ -11,6 +11,7 @@
 #include <string>
 #include <vector>
 
+#include "cgi/file_lock.h"
 #include "sim/lib/account_files.h"
 #include "tools.h"
 
@@ -43,6 +44,9 @@ int tool_gpasswd(int argc, char** argv)
 {
     if (!has_form(argc, argv, "-d"))
         return usage("gpasswd");
+    const auto lock = FileLock::acquire("accounts");
+    if (!lock)
+        return 1;
     const std::string user = argv[2];
     const std::string name = argv[3];
     ColonFile groups = ColonFile::load(kGroupFile);
@@ -65,6 +69,9 @@ int tool_usermod(int argc, char** argv)
 {
     if (!has_form(argc, argv, "-g"))
         return usage("usermod");
+    const auto lock = FileLock::acquire("accounts");
+    if (!lock)
+        return 1;
     const std::string wanted = argv[2];
     const std::string user = argv[3];
     const ColonFile groups = ColonFile::load(kGroupFile);
@@ -91,6 +98,9 @@ int tool_chfn(int argc, char** argv)
 {
     if (!has_form(argc, argv, "-o"))
         return usage("chfn");
+    const auto lock = FileLock::acquire("accounts");
+    if (!lock)
+        return 1;
     const std::string other = argv[2];
     const std::string user = argv[3];
     if (other.find_first_of(":,=\n") != std::string::npos) {

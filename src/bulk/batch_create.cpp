@@ -3,9 +3,12 @@
 // background, creates them while the page polls cgi_get_create_status.
 #include <cstdio>
 #include <cstdlib>
+#include <new>
+#include <string>
 
+#include "cgi/atomic_file.h"
 #include "cgi/event_log.h"
-#include "cgi/file.h"
+#include "cgi/file_lock.h"
 #include "cgi/fixed_text.h"
 #include "cgi/form.h"
 #include "cgi/handlers.h"
@@ -46,7 +49,13 @@ void cgi_user_batch_create()
     // three digits, a start of "1" does not pad at all.
     const int width = static_cast<int>(start.length());
     int last = -1;
-    if (const UniqueFile records = open_file(kBatchRecordFile, "w+")) {
+    // The records are gathered first and replace the record file at once, under its
+    // lock: an account_mgr run still working on the previous batch has read its whole
+    // file already (sim/tools/account_mgr.cpp tells how runs follow each other).
+    // A file that cannot be written is a file that cannot be opened: no record, the
+    // tool is still started and the event still logged.
+    try {
+        std::string records;
         int current = static_cast<int>(decimal(start.c_str()));
         // Start and count are read again on every pass.
         while (decimal(start.c_str()) + decimal(number.c_str()) > current) {
@@ -59,9 +68,13 @@ void cgi_user_batch_create()
             record.format("%s\t%s\t%s\t%s\t%s\t%s\t%s\n", name.c_str(),
                           password.c_str(), groups.c_str(), write_list.c_str(), read_list.c_str(),
                           deny_list.c_str(), quota.c_str());
-            std::fputs(record.c_str(), records.get());
+            records += record.c_str();
         }
-        last = current - 1;
+        const auto lock = FileLock::acquire("account_batch_info");
+        if (lock && replace_file(kBatchRecordFile, records))
+            last = current - 1;
+    } catch (const std::bad_alloc&) {
+        last = -1;
     }
 
     FixedText<kBatchLineSize> line;

@@ -8,6 +8,7 @@
 #include <unistd.h>
 
 #include "cgi/file.h"
+#include "cgi/file_lock.h"
 #include "cgi/fixed_text.h"
 #include "cgi/form.h"
 #include "cgi/handlers.h"
@@ -93,7 +94,10 @@ void cgi_import_uesrs()
 {
     FixedText<1024> client_name;
     cgiFormFileName("fileToUpload", client_name.data(), client_name.size());
-    cgiFormFileRename("fileToUpload", kImportUsers);
+    // The upload is renamed into place under the file's lock: an account_mgr run
+    // reading the previous one sees it whole.
+    if (const auto lock = FileLock::acquire("import_users"))
+        cgiFormFileRename("fileToUpload", kImportUsers);
     answer_empty_html();
 }
 

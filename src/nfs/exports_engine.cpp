@@ -6,9 +6,12 @@
 #include <memory>
 #include <mntent.h>
 #include <new>
+#include <string>
 #include <unistd.h>
 
+#include "cgi/atomic_file.h"
 #include "cgi/file.h"
+#include "cgi/file_lock.h"
 #include "cgi/shell.h"
 #include "cgi/trace.h"
 #include "nfs/exports_parser.h"
@@ -49,9 +52,12 @@ bool is_iso_folder(const FixedText<4096>& folder)
     return std::strncmp(folder.c_str(), "/mnt/isoMount/", 14) == 0;
 }
 
-void write_text(FILE* file, const char* text)
+// Every store is built in memory and then replaces its file at once (atomic_file.h),
+// all under the "exports" lock (file_lock.h): /etc/exports, the per-volume copies and
+// their fixed staging files, the USB ".exports" files and the "/nfs" link.
+void write_text(std::string& content, const char* text)
 {
-    std::fputs(text, file);
+    content += text;
 }
 
 // A folder that got its first rule in "/etc/exports": the "/nfs" root of the share-link
@@ -81,15 +87,12 @@ int modify_usb_exports(const FixedText<4096>& folder_realp, const char* host, co
         return 0;
     }
 
-    UniqueFile file = open_file(store.c_str(), "w");
-    if (!file) {
+    FixedText<1024> line;
+    make_config_string(folder_realp.c_str(), newip != nullptr ? newip : host, rw, root_squash, line, 1);
+    if (!replace_file(store.c_str(), line.view())) {
         printf_out("Cannot open file[%s]!!!\n", store.c_str());
         return -1;
     }
-    FixedText<1024> line;
-    make_config_string(folder_realp.c_str(), newip != nullptr ? newip : host, rw, root_squash, line, 1);
-    write_text(file.get(), line.c_str());
-    file.reset();
     printf_out("write to USB hidden conf file, bufs\n[%s]\n\n", line.c_str());
     return 0;
 }
@@ -110,6 +113,9 @@ int publish_staged_copy(bool iso, const VolumePrefix& volume)
 int modify_config_string_base(const char* folder, const char* host, const char* newip, int rw, int root_squash,
                               int del)
 {
+    const auto lock = FileLock::acquire("exports");
+    if (!lock)
+        return -1;
     const FixedText<4096> folder_realp = resolve_folder(folder);
 
     // A missing "/etc/exports" fails every operation; it is not created here.
@@ -123,22 +129,26 @@ int modify_config_string_base(const char* folder, const char* host, const char* 
     if (!list->next) {
         if (del != 0)
             return 0;
-        UniqueFile file = open_file(kSystemExports, "a");
-        if (!file)
+        // An append: the file as it is, and the new line after it.
+        std::string content;
+        if (!read_whole_file(kSystemExports, content))
             return -1;
         make_config_string(folder_realp.c_str(), newip != nullptr ? newip : host, rw, root_squash, line, 0);
-        write_text(file.get(), line.c_str());
-        file.reset();
+        write_text(content, line.c_str());
+        if (!replace_file(kSystemExports, content))
+            return -1;
         follow_up_new_rule(folder_realp);
         return 0;
     }
 
     // The whole file is rewritten from the parsed rules.
-    UniqueFile file = open_file(kSystemExports, "w+");
-    if (!file) {
+    std::string file;
+    const auto save = [&file] {
+        if (replace_file(kSystemExports, file))
+            return true;
         printf_out("Failed to open config file!\n");
-        return -1;
-    }
+        return false;
+    };
     bool found = false;
     for (exports_entry* record = list->next.get(); record != nullptr; record = record->next.get()) {
         FixedText<4096> resolved;
@@ -147,7 +157,7 @@ int modify_config_string_base(const char* folder, const char* host, const char* 
 
         if (!(record->volume == folder_realp.view())) {
             make_config_string(record->volume.c_str(), record->ip.c_str(), record->rw, record->root_squash, line, 0);
-            write_text(file.get(), line.c_str());
+            write_text(file, line.c_str());
             continue;
         }
         // The folder keeps one host in this file: a rule of the folder for another
@@ -167,25 +177,28 @@ int modify_config_string_base(const char* folder, const char* host, const char* 
         record->rw = rw;
         record->root_squash = root_squash;
         make_config_string(record->volume.c_str(), record->ip.c_str(), record->rw, record->root_squash, line, 0);
-        write_text(file.get(), line.c_str());
+        write_text(file, line.c_str());
         printf_out("%s %s found!!!\nwrite buf\n[%s]\n\n", folder_realp.c_str(), host, line.c_str());
     }
 
     if (found)
-        return 0;
+        return save() ? 0 : -1;
     // Deleting a rule that is not there: the rewrite of the others stands.
-    if (del != 0)
+    if (del != 0) {
+        save();
         return -1;
+    }
     if (newip != nullptr) {
         printf_out("folder_realp[%s] ip[%s] newip[%s] setting not exist, modify skip!!!\n\n", folder_realp.c_str(),
                    host, newip);
     } else {
         make_config_string(folder_realp.c_str(), host, rw, root_squash, line, 0);
-        write_text(file.get(), line.c_str());
+        write_text(file, line.c_str());
         printf_out("write new folder_realp[%s] host[%s]\n write buf\n[%s]\n\n", folder_realp.c_str(), host,
                    line.c_str());
     }
-    file.reset();
+    if (!save())
+        return -1;
     follow_up_new_rule(folder_realp);
     return 0;
 }
@@ -193,6 +206,9 @@ int modify_config_string_base(const char* folder, const char* host, const char* 
 int modify_hidden_config_string_base(const char* folder, const char* host, const char* newip, int rw,
                                      int root_squash, int del)
 {
+    const auto lock = FileLock::acquire("exports");
+    if (!lock)
+        return -1;
     const FixedText<4096> folder_realp = resolve_folder(folder);
     if (is_usb_folder(folder_realp))
         return modify_usb_exports(folder_realp, host, newip, rw, root_squash, del);
@@ -242,22 +258,21 @@ int modify_hidden_config_string_base(const char* folder, const char* host, const
             printf_out("no conf to delete open_config_path[%s] cur[%p]\n", source ? source.get() : "(null)", first);
             return 0;
         }
-        UniqueFile file = open_file(staging, "w+");
-        if (!file) {
+        make_config_string(folder_realp.c_str(), newip != nullptr ? newip : host, rw, root_squash, line, 1);
+        if (!replace_file(staging, line.view())) {
             printf_out(iso ? "can't open /tmp/exports_iso .\n" : "can't open /tmp/exports .\n");
             return -1;
         }
-        make_config_string(folder_realp.c_str(), newip != nullptr ? newip : host, rw, root_squash, line, 1);
-        write_text(file.get(), line.c_str());
-        file.reset();
         return publish_staged_copy(iso, volume);
     }
 
-    UniqueFile file = open_file(staging, "w+");
-    if (!file) {
+    std::string file;
+    const auto stage = [&file, staging] {
+        if (replace_file(staging, file))
+            return true;
         printf_out("can't open /tmp/exports or /tmp/exports_iso file.\n");
-        return -1;
-    }
+        return false;
+    };
     bool found = false;
     for (exports_entry* record = list->next.get(); record != nullptr; record = record->next.get()) {
         if (record->volume.empty())
@@ -278,7 +293,7 @@ int modify_hidden_config_string_base(const char* folder, const char* host, const
         }
         if (!match) {
             make_config_string(full_path.c_str(), record->ip.c_str(), record->rw, record->root_squash, line, 1);
-            write_text(file.get(), line.c_str());
+            write_text(file, line.c_str());
             continue;
         }
         found = true;
@@ -296,7 +311,7 @@ int modify_hidden_config_string_base(const char* folder, const char* host, const
         record->rw = rw;
         record->root_squash = root_squash;
         make_config_string(full_path.c_str(), record->ip.c_str(), record->rw, record->root_squash, line, 1);
-        write_text(file.get(), line.c_str());
+        write_text(file, line.c_str());
         printf_out("found!! hidden write bufs\n[%s]\n", line.c_str());
     }
 
@@ -304,6 +319,7 @@ int modify_hidden_config_string_base(const char* folder, const char* host, const
         // The staging file stays behind; the next operation overwrites it.
         if (del != 0) {
             printf_out("conf string not found!!!\n");
+            stage();
             return -1;
         }
         if (newip != nullptr) {
@@ -311,12 +327,13 @@ int modify_hidden_config_string_base(const char* folder, const char* host, const
                        folder_realp.c_str(), host, newip);
         } else {
             make_config_string(folder_realp.c_str(), host, rw, root_squash, line, 1);
-            write_text(file.get(), line.c_str());
+            write_text(file, line.c_str());
             printf_out("write new hidden, folder_realp[%s] host[%s]\n write buf\n[%s]\n\n", folder_realp.c_str(),
                        host, line.c_str());
         }
     }
-    file.reset();
+    if (!stage())
+        return -1;
     return publish_staged_copy(iso, volume);
 }
 
