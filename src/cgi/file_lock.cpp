@@ -1,5 +1,6 @@
 #include "cgi/file_lock.h"
 
+#include <algorithm>
 #include <cerrno>
 #include <fcntl.h>
 #include <string>
@@ -8,10 +9,32 @@
 #include <syslog.h>
 #include <thread>
 #include <unistd.h>
+#include <vector>
 
 namespace {
 
 constexpr const char* kLockFolder = "/var/lock";
+
+// The resources this process holds: a second lock of one of them is the first one
+// again (a new descriptor would wait for the process itself).
+std::vector<std::string>& held()
+{
+    static std::vector<std::string> names;
+    return names;
+}
+
+// The resources this process gave up waiting for: it does not wait for them again,
+// so that a command logs one event and waits once.
+std::vector<std::string>& given_up()
+{
+    static std::vector<std::string> names;
+    return names;
+}
+
+bool listed(const std::vector<std::string>& names, std::string_view name)
+{
+    return std::find(names.begin(), names.end(), name) != names.end();
+}
 
 int open_lock_file(const std::string& path)
 {
@@ -24,8 +47,9 @@ int open_lock_file(const std::string& path)
     return fd;
 }
 
-void log_gave_up(std::string_view resource)
+void give_up(std::string_view resource)
 {
+    given_up().emplace_back(resource);
     openlog("SYSTEM", 0, 0);
     syslog(LOG_INFO, "Gave up waiting for the lock of \"%.*s\".", static_cast<int>(resource.size()),
            resource.data());
@@ -36,51 +60,45 @@ void log_gave_up(std::string_view resource)
 
 std::optional<FileLock> FileLock::acquire(std::string_view resource, Mode mode, std::chrono::milliseconds wait)
 {
-    const std::string path = std::string(kLockFolder) + "/" + std::string(resource) + ".lock";
-    const int fd = open_lock_file(path);
+    if (listed(given_up(), resource))
+        return std::nullopt;
+    if (listed(held(), resource))
+        return FileLock(-1, std::string(resource));
+
+    const int fd = open_lock_file(std::string(kLockFolder) + "/" + std::string(resource) + ".lock");
     if (fd < 0) {
-        log_gave_up(resource);
+        give_up(resource);
         return std::nullopt;
     }
-    FileLock lock(fd);
+    FileLock lock(fd, std::string(resource));
     const int operation = mode == Mode::shared ? LOCK_SH : LOCK_EX;
     const auto deadline = std::chrono::steady_clock::now() + wait;
     // Polled rather than blocking, so that the wait stays bounded without a signal;
     // the pause grows from 1 ms to 16 ms.
     std::chrono::milliseconds pause{1};
     for (;;) {
-        if (flock(fd, operation | LOCK_NB) == 0)
+        if (flock(fd, operation | LOCK_NB) == 0) {
+            held().push_back(lock.m_resource);
             return lock;
-        if (errno != EWOULDBLOCK && errno != EINTR)
-            break;
-        if (std::chrono::steady_clock::now() >= deadline)
+        }
+        if ((errno != EWOULDBLOCK && errno != EINTR) || std::chrono::steady_clock::now() >= deadline)
             break;
         std::this_thread::sleep_for(pause);
-        if (pause < std::chrono::milliseconds{16})
-            pause *= 2;
+        pause = std::min(pause * 2, std::chrono::milliseconds{16});
     }
-    log_gave_up(resource);
+    give_up(resource);
     return std::nullopt;
 }
 
-FileLock::FileLock(FileLock&& other) noexcept : m_fd(other.m_fd)
+FileLock::FileLock(FileLock&& other) noexcept : m_fd(other.m_fd), m_resource(std::move(other.m_resource))
 {
     other.m_fd = -1;
 }
 
-FileLock& FileLock::operator=(FileLock&& other) noexcept
-{
-    if (this != &other) {
-        if (m_fd >= 0)
-            close(m_fd);
-        m_fd = other.m_fd;
-        other.m_fd = -1;
-    }
-    return *this;
-}
-
 FileLock::~FileLock()
 {
-    if (m_fd >= 0)
-        close(m_fd);   // closing the only descriptor releases the lock
+    if (m_fd < 0)
+        return;   // a lock held further out, or a moved-from one
+    std::erase(held(), m_resource);
+    close(m_fd);  // closing the only descriptor releases the lock
 }

@@ -21,16 +21,21 @@
 //     quota               the quota store
 //     dfs                 the DFS links and groups
 //     acl                 the default-ACL store
-// A lock is held only while its files are read, changed and written, never across a
-// request's other work.
+// A lock is held from the read of its files to their final rename, and no longer
+// (the exports lock also over the "/nfs" link that a new rule makes again).
 //
 // Waiting is bounded: after kLockWait the caller takes its failure path, and the
-// device's system log gets one event naming the resource.
+// device's system log gets one event naming the resource; the process then fails at
+// once on that resource for the rest of its run (one event, one wait per command).
+// A process that asks again for a resource it holds gets it at once (the lock is
+// released when the outermost holder ends).
 #pragma once
 
 #include <chrono>
 #include <optional>
+#include <string>
 #include <string_view>
+#include <utility>
 
 inline constexpr std::chrono::milliseconds kLockWait{5000};
 
@@ -44,12 +49,13 @@ public:
                                            std::chrono::milliseconds wait = kLockWait);
 
     FileLock(FileLock&& other) noexcept;
-    FileLock& operator=(FileLock&& other) noexcept;
+    FileLock& operator=(FileLock&&) = delete;
     FileLock(const FileLock&) = delete;
     FileLock& operator=(const FileLock&) = delete;
     ~FileLock();
 
 private:
-    explicit FileLock(int fd) : m_fd(fd) {}
-    int m_fd = -1;
+    FileLock(int fd, std::string resource) : m_fd(fd), m_resource(std::move(resource)) {}
+    int m_fd = -1;              // -1: the resource was held already by this process
+    std::string m_resource;
 };

@@ -283,3 +283,29 @@ until_true '[ ! -e /tmp/start_create_users ]'
     EXPECT_EQ(dev.read_file("/tmp/account_status"), "v01:0\nv02:0\n");
     EXPECT_EQ(dev.read_file("/tmp/account_batch_info").substr(0, 4), "v01\t");
 }
+
+// While another process holds the exports lock past the bounded wait, an NFS rule
+// change gives up: the answer is the usual one, /etc/exports stays as it was, and the
+// system log has one event however many times the command needed the lock.
+TEST(DataSafety, ABusyLockIsWaitedForAWhileThenGivenUpWithOneEvent)
+{
+    Device dev;
+    dev.symlink("/shares", "/nfs");
+    const std::string rules = nfs_rule("/nfs/Public", "10.9.9.9") + "\n";
+    dev.write_file("/etc/exports", rules);
+    const std::string script =
+        "mkdir -p /var/lock\n"
+        "exec 9>/var/lock/exports.lock\n"
+        "flock 9\n" +
+        request_line(query("cgi_set_nfs_share", {{"host", "10.0.0.1"}, {"path", "/mnt/HD/HD_a2/Public"},
+                                                 {"rw", "1"}, {"rootsquash", "1"}}),
+                     "/tmp/answer") +
+        " 9>&-\n";
+    const Reply reply = dev.run({"/bin/sh", "-c", script});
+    ASSERT_EQ(reply.status, 0) << reply.err;
+    EXPECT_EQ(dev.read_file("/tmp/answer"), kEmptyHtml);
+    EXPECT_EQ(dev.read_file("/etc/exports"), rules);
+    EXPECT_FALSE(dev.exists("/mnt/HD/HD_a2/.systemfile/exports"));
+    EXPECT_EQ(dev.messages(), (std::vector<std::string>{"<14>SYSTEM: Gave up waiting for the lock of \"exports\"."}));
+    EXPECT_EQ(shell_lines(dev.journal()), (std::vector<std::string>{"exportfs -r > /dev/null 2>&1"}));
+}
