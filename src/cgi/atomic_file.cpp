@@ -80,17 +80,6 @@ bool replace_file(const std::string& path, std::string_view content)
     return sync_folder(folder_of(path));
 }
 
-bool append_file(const std::string& path, std::string_view content)
-{
-    Descriptor file(::open(path.c_str(), O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0644));
-    if (!file.valid())
-        return false;
-    // One write, so that the bytes land together; a short write is a failure.
-    const ssize_t written = ::write(file.get(), content.data(), content.size());
-    const bool synced = written == static_cast<ssize_t>(content.size()) && ::fsync(file.get()) == 0;
-    return file.close() && synced;
-}
-
 bool read_whole_file(const std::string& path, std::string& content)
 {
     Descriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));

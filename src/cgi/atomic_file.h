@@ -1,4 +1,4 @@
-// Rewriting and appending to the device's files so that a reader, a crash or a full
+// Rewriting the device's files so that a reader, a crash or a full
 // disk never leaves a file half written.
 #pragma once
 
@@ -11,10 +11,6 @@
 // over the old one; then the folder itself is synced. On any failure the old file
 // stays byte for byte as it was, the temporary file is removed, and the result is false.
 bool replace_file(const std::string& path, std::string_view content);
-
-// Appends `content` to the file (created when missing) with one write, then syncs
-// it. The caller holds the file's lock.
-bool append_file(const std::string& path, std::string_view content);
 
 // The whole file, or nothing (false) when it cannot be read.
 bool read_whole_file(const std::string& path, std::string& content);
