@@ -2,6 +2,7 @@
 
 #include <crypt.h>
 #include <ctime>
+#include <unistd.h>
 
 #include "text_file.h"
 
@@ -138,14 +139,18 @@ namespace {
 
 void rewrite_hints(std::string_view user, const std::optional<std::string>& new_line)
 {
+    const std::vector<std::string> before = read_lines(kHintFile);
     std::vector<std::string> lines;
-    for (const std::string& line : read_lines(kHintFile)) {
+    for (const std::string& line : before) {
         const auto tab = line.find('\t');
         if (tab == std::string::npos || std::string_view(line).substr(0, tab) != user)
             lines.push_back(line);
     }
     if (new_line)
         lines.push_back(*new_line);
+    // A file that would stay as it is is not written again (most users have no hint).
+    if (lines == before && access(kHintFile, F_OK) == 0)
+        return;
     write_lines(kHintFile, lines);
 }
 

@@ -37,7 +37,9 @@
 #include <string_view>
 #include <utility>
 
-inline constexpr std::chrono::milliseconds kLockWait{5000};
+// Long enough for a queue of requests on a busy device (twenty account creations at
+// once each hold the account files for a few synced rewrites).
+inline constexpr std::chrono::milliseconds kLockWait{10000};
 
 class FileLock {
 public:
