@@ -17,6 +17,7 @@
 #include "cgi/handlers.h"
 #include "cgi/response.h"
 #include "cgi/shell.h"
+#include "cgi/text_escape.h"
 #include "cgi/trace.h"
 #include "platform/cgic.h"
 #include "platform/config_store.h"
@@ -49,13 +50,14 @@ bool join_succeeded(int status)
     return status == 1 || status == 50 || status == 100;
 }
 
-// Puts three DNS servers back as the LAN's; config values, not escaped. The trace is
+// Puts three DNS servers back as the LAN's. The config values stand inside the line's
+// double quotes, escaped for them (a page filled them). The trace is
 // "set old dns1 to xml cmd1=[...]" after a leave, "...cmd2=[...]" after a failure.
 void restore_dns(const char* dns1, const LanDns& lan, int trace_number)
 {
     FixedText<kCommandLineSize> line;
-    line.format("network -x \"%s\" -D \"%s %s %s\" >/dev/null 2>&1", "0", dns1,
-                  lan.dns2.c_str(), lan.dns3.c_str());
+    line.format("network -x \"%s\" -D \"%s %s %s\" >/dev/null 2>&1", "0", inside_double_quotes(dns1).c_str(),
+                inside_double_quotes(lan.dns2.view()).c_str(), inside_double_quotes(lan.dns3.view()).c_str());
     printf_out("set old dns1 to xml cmd%d=[%s]\n", trace_number, line.c_str());
     run_system(line.c_str());
 }

@@ -153,10 +153,10 @@ void cgi_get_user_info()
     out("<user_info>\n");
     out("<total>%d</total>", user_count);
     out("<all_user>");
-    out(users.c_str());
+    out("%s", users.c_str());
     out("</all_user>");
     out("<all_group>");
-    out(groups.c_str());
+    out("%s", groups.c_str());
     out("</all_group>");
     out("<hddnum>%d</hddnum>", volumes);
     out("<hddsize>%s</hddsize>", sizes.c_str());
