@@ -10,6 +10,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <string>
 
 #include "cgi/file.h"
 #include "cgi/fixed_text.h"
@@ -76,8 +77,15 @@ bool first_line_of(const char* command, FixedText<512>& line, bool trace_workgro
     if (!pipe)
         return false;
     read_line(pipe.get(), line);
-    if (trace_workgroup)
-        printf_out("workgroup=[%s]\n", line.c_str());
+    if (trace_workgroup && trace_enabled()) {
+        // The line keeps the line end it was read with, as the trace always showed it;
+        // anything else in it that would start a line is escaped.
+        std::string text(line.view());
+        const bool line_end = !text.empty() && text.back() == '\n';
+        if (line_end)
+            text.pop_back();
+        printf_out_text(("workgroup=[" + one_line(text) + (line_end ? "\n" : "") + "]\n").c_str());
+    }
     // Only the last character goes; an empty line stays empty.
     if (const std::size_t length = line.length(); length > 0)
         line[length - 1] = '\0';
