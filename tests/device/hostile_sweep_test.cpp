@@ -133,7 +133,7 @@ std::string shown(const std::string& payload)
     return text;
 }
 
-const std::vector<std::string> kAlways = {"/var/log", "/tmp"};
+const std::vector<std::string> kAlways = {"/var/log", "/tmp", "/var/lock"};
 const std::vector<std::string> kAccounts = {"/etc/passwd", "/etc/shadow", "/etc/group", "/var/lib/platform"};
 const std::vector<std::string> kShares = {"/etc/passwd", "/etc/shadow", "/etc/group", "/var/lib/platform",
                                           "/shares", "/mnt/HD/HD_a2"};
