@@ -23,7 +23,7 @@ import urllib.request
 import warnings
 
 from selenium import webdriver
-from selenium.common.exceptions import TimeoutException
+from selenium.common.exceptions import StaleElementReferenceException, TimeoutException
 from selenium.webdriver.chrome.service import Service
 from selenium.webdriver.common.by import By
 from selenium.webdriver.common.keys import Keys
@@ -130,7 +130,8 @@ class ConsoleTest(unittest.TestCase):
         options.set_capability('goog:loggingPrefs', {'browser': 'ALL'})
         self.browser = webdriver.Chrome(service=Service('/usr/bin/chromedriver'), options=options)
         self.addCleanup(self.browser.quit)
-        self.wait = WebDriverWait(self.browser, WAIT)
+        # The page redraws its tables after each change: a row found just before is read again.
+        self.wait = WebDriverWait(self.browser, WAIT, poll_frequency=0.05, ignored_exceptions=(StaleElementReferenceException,))
         if self.width < 500:
             # A window is never narrower than 500 pixels; a phone's screen is emulated.
             self.browser.execute_cdp_cmd('Emulation.setDeviceMetricsOverride',
@@ -183,7 +184,8 @@ class ConsoleTest(unittest.TestCase):
         return self.find(f'tr[data-key="{key}"]')
 
     def keys(self, table='main table'):
-        return [r.get_attribute('data-key') for r in self.browser.find_elements(By.CSS_SELECTOR, f'{table} tbody tr[data-key]')]
+        return self.browser.execute_script(
+            'return Array.from(document.querySelectorAll(arguments[0]), (r) => r.dataset.key)', f'{table} tbody tr[data-key]')
 
     def message(self, kind, text, root=None):
         """Waits for the message line to say text; returns what it says."""
