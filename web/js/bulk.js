@@ -40,7 +40,7 @@ async function follow({ ftype, names, kind, before, view }) {
     if (status === '-1') seenRunning = true;
     // The run starts in the background: until it has been seen running, an old
     // status is not its result.
-    const over = status !== '-1' && (seenRunning || created.length === names.length || Date.now() - started > 4000);
+    const over = status !== '-1' && (seenRunning || created.length === names.length || Date.now() - started > 8000);
     if (over) {
       view.bar.value = view.bar.max;
       const failed = names.filter((n) => !created.includes(n));
