@@ -2,13 +2,16 @@
 #   make demo    the simulated device with the program behind a real web server
 #   make test    build and pass every test (also under ASan+UBSan with SANITIZE=1)
 #   make bench   the benchmark ratios
+#   make fuzz    the fuzz targets (clang), each for FUZZ_SECONDS (default 60)
 BUILD ?= build
 ASAN_BUILD ?= build-asan
 JOBS ?= 2
 PORT ?= 8080
 DEMO ?= demo-device
+FUZZ_SECONDS ?= 60
+FUZZ_BUILD ?= build-fuzz
 
-.PHONY: all setup build test test-asan bench demo clean
+.PHONY: all setup build test test-asan bench demo fuzz clean
 
 all: build
 
@@ -36,5 +39,9 @@ bench: build
 demo: build
 	@scripts/demo $(DEMO) $(PORT)
 
+fuzz:
+	@scripts/setup-machine fuzz
+	@FUZZ_SECONDS=$(FUZZ_SECONDS) FUZZ_BUILD=$(FUZZ_BUILD) JOBS=$(JOBS) fuzz/run
+
 clean:
-	rm -rf $(BUILD) $(ASAN_BUILD)
+	rm -rf $(BUILD) $(ASAN_BUILD) $(FUZZ_BUILD)

@@ -7,6 +7,7 @@
 #include <cstring>
 #include <unistd.h>
 
+#include "bulk/import_listing.h"
 #include "cgi/file.h"
 #include "cgi/fixed_text.h"
 #include "cgi/form.h"
@@ -15,15 +16,13 @@
 #include "cgi/shell.h"
 #include "cgi/trace.h"
 #include "platform/cgic.h"
-#include "platform/share.h"
 
 namespace {
 
 constexpr const char* kImportUsers = "/tmp/import_users";
 constexpr const char* kImportGroups = "/tmp/import_groups";
 
-// One <item> per record line; CR/LF are cut, empty and "#" lines are comments. A line
-// longer than the 12288-byte reader comes out as several items.
+// One <item> per record line (import_listing.h), or "ng" without the file.
 void list_import_file(const char* path)
 {
     const UniqueFile file = open_file(path, "r");
@@ -33,17 +32,7 @@ void list_import_file(const char* path)
         out("<info><status>ng</status></info>\n");
         return;
     }
-    out("<info>\n");
-    FixedText<12288> line;
-    while (read_line(file.get(), line)) {
-        remove_0D_0A(line.data());
-        if (line.empty() || line[0] == '#')
-            continue;
-        out("<item>");
-        cgiHtmlEscape(line.c_str());
-        out("</item>\n");
-    }
-    out("</info>\n");
+    write_import_items(file.get());
 }
 
 // account_mgr -u for a user file, -g for a group file.

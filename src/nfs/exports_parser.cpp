@@ -108,6 +108,11 @@ ExportsList load_exports_config(const char* path)
         printf_out("I can't find any config file.\n");
         return nullptr;
     }
+    return parse_exports_config(file.get());
+}
+
+ExportsList parse_exports_config(FILE* file)
+{
     ExportsList head = new_exports_entry();
     if (!head) {
         printf_out("can't malloc memory.\n");
@@ -117,7 +122,7 @@ ExportsList load_exports_config(const char* path)
     FixedText<512> line;
     exports_entry* current = head.get();
     bool reuse_current = false;     // a skipped line leaves its cleared record for the next one
-    while (read_line(file.get(), line)) {
+    while (read_line(file, line)) {
         if (!reuse_current) {
             current->next = new_exports_entry();
             if (!current->next) {
@@ -128,7 +133,7 @@ ExportsList load_exports_config(const char* path)
         }
         // A last line without its newline is never parsed: its record stays cleared
         // at the end of the list, and the next rewrite of the file loses that line.
-        if (std::feof(file.get()))
+        if (std::feof(file))
             break;
         reuse_current = !parse_line(line.c_str(), *current);
     }

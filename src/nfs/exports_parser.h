@@ -40,6 +40,8 @@ ExportsList new_exports_entry();
 
 // Parses an exports file. Nothing when the file cannot be opened or memory runs out.
 ExportsList load_exports_config(const char* path);
+// The same for a file already open for reading, from its current position.
+ExportsList parse_exports_config(FILE* file);
 
 // The records after the head, counted (the share overview tells one record from many).
 int count_records(const ExportsList& list);
