@@ -20,13 +20,33 @@ std::string journal_escape(std::string_view argument)
 
 namespace {
 
+// The journal stays open for the rest of the process after its first event, as a real
+// platform library keeps its log: one write per event instead of an open, a write and
+// a close. Every write appends, so the lines of other processes still fall in order.
+class JournalFile {
+public:
+    ~JournalFile()
+    {
+        if (m_fd >= 0)
+            close(m_fd);
+    }
+    void append(const std::string& line)
+    {
+        if (m_fd < 0)
+            m_fd = open(kJournalPath, O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0644);
+        if (m_fd < 0)
+            return;
+        [[maybe_unused]] const ssize_t written = write(m_fd, line.data(), line.size());
+    }
+
+private:
+    int m_fd = -1;
+};
+
 void append_line(const std::string& line)
 {
-    const int fd = open(kJournalPath, O_WRONLY | O_APPEND | O_CREAT | O_CLOEXEC, 0644);
-    if (fd < 0)
-        return;
-    [[maybe_unused]] const ssize_t written = write(fd, line.data(), line.size());
-    close(fd);
+    static JournalFile journal;
+    journal.append(line);
 }
 
 } // namespace

@@ -31,6 +31,7 @@
 #include <strings.h>
 
 #include "account_files.h"
+#include "group_memberships.h"
 #include "journal.h"
 #include "share_store.h"
 
@@ -193,7 +194,7 @@ extern "C" int change_user_group_name(const char* old_name, const char* new_name
 extern "C" int LIB_Web_Get_User_Join_Group(const char* user, char* buffer)
 {
     journal_record("LIB_Web_Get_User_Join_Group", {user});
-    copy_cut(buffer, joined_groups(ColonFile::load(kGroupFile), user), 55296);
+    copy_cut(buffer, joined_groups_of(user), 55296);
     return 0;
 }
 

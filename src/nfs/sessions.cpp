@@ -11,6 +11,7 @@
 #include "cgi/handlers.h"
 #include "cgi/response.h"
 #include "cgi/trace.h"
+#include "nfs/canonical_paths.h"
 #include "nfs/exports_parser.h"
 #include "platform/cgic.h"
 #include "platform/config_store.h"
@@ -18,81 +19,113 @@
 
 namespace {
 
-// The canonical paths of the rules' folders, resolved once per request: every share's
-// look-up examines the same rules again, and a path resolves the same way throughout
-// one request. Unresolvable texts are remembered as such.
-class ResolvedPaths {
-public:
-    const std::optional<std::string>& of(const char* path)
-    {
-        auto [place, inserted] = m_paths.try_emplace(path);
-        if (inserted) {
-            FixedText<4096> resolved;
-            if (canonical_path(path, resolved))
-                place->second = std::string(resolved.view());
-        }
-        return place->second;
-    }
-
-private:
-    std::unordered_map<std::string, std::optional<std::string>> m_paths;
-};
-
-// Looks at one rule for the share path. A rule whose path resolves is compared as the
-// first 8 characters of its canonical path ("/mnt/HD/" for a hard-disk share), so the
+// The text a rule is compared as: a rule whose path resolves is compared as the first
+// 8 characters of its canonical path ("/mnt/HD/" for a hard-disk share), so the
 // share-link lines the engine writes match no share; only a rule whose written path
 // does not resolve and equals the share path reports a rule. The page has always been
 // answered this way, so the 8-character copy stays.
-bool examine_rule(exports_entry& record, const char* share_path, FixedText<8>& root_squash, FixedText<8>& write,
-                  FixedText<64>& host, ResolvedPaths& resolved_paths)
+std::string compared_text(const exports_entry& record, CanonicalPaths& resolved_paths)
 {
-    if (const auto& resolved = resolved_paths.of(record.volume.c_str())) {
-        record.volume.clear();
-        record.volume.assign(std::string_view(*resolved).substr(0, 8));
-    }
-    if (!(record.volume == share_path))
-        return false;
-    root_squash.assign(record.root_squash == 1 ? "Yes" : "No");
-    write.assign(record.rw == 1 ? "Yes" : "No");
-    host.assign(record.ip.view());
-    return true;
+    if (const auto& resolved = resolved_paths.of(std::string(record.volume.view())))
+        return std::string(std::string_view(*resolved).substr(0, 8));
+    return std::string(record.volume.view());
 }
 
-// 1 when "/etc/exports" holds a rule for the share path (the last matching rule wins),
-// else 0. The host text is written only on a match.
-int nfs_rule_lookup(const char* share_path, FixedText<8>& root_squash, FixedText<8>& write, FixedText<64>& host,
-                    ResolvedPaths& resolved_paths)
-{
-    root_squash.clear();
-    write.clear();
-    const ExportsList list = load_exports_config("/etc/exports");
-    if (!list || !list->next)
-        return 0;
+struct RuleTexts {
+    FixedText<8> root_squash;
+    FixedText<8> write;
+    FixedText<64> host;
+};
 
-    if (!list->next->next) {
+void report_rule(const exports_entry& record, RuleTexts& texts)
+{
+    texts.root_squash.assign(record.root_squash == 1 ? "Yes" : "No");
+    texts.write.assign(record.rw == 1 ? "Yes" : "No");
+    texts.host.assign(record.ip.view());
+}
+
+// "/etc/exports" as every share's look-up sees it. Without the debug trace the file is
+// parsed once per request and its rules are found by their compared text; with the
+// trace each look-up parses the file and examines every rule again, so that the trace
+// tells the same story per share as it always has.
+class ExportRules {
+public:
+    explicit ExportRules(bool tracing) : m_tracing(tracing)
+    {
+        if (m_tracing)
+            return;
+        m_list = load_exports_config("/etc/exports");
+        if (!m_list)
+            return;
+        m_records = count_records(m_list);
+        if (m_records < 2)
+            return;
+        // The last rule of a text wins, as the examination in file order leaves it.
+        for (const exports_entry* record = m_list->next.get(); record != nullptr; record = record->next.get())
+            m_last_of[compared_text(*record, m_resolved_paths)] = record;
+    }
+
+    // 1 when "/etc/exports" holds a rule for the share path (the last matching rule
+    // wins), else 0. The host text is written only on a match.
+    int lookup(const char* share_path, RuleTexts& texts)
+    {
+        texts.root_squash.clear();
+        texts.write.clear();
+        if (m_tracing)
+            return traced_lookup(share_path, texts);
+        if (!m_list || m_records == 0)
+            return 0;
+        if (m_records == 1)
+            return single_rule(*m_list->next, share_path, texts);
+        const auto found = m_last_of.find(share_path);
+        if (found == m_last_of.end())
+            return 0;
+        report_rule(*found->second, texts);
+        return 1;
+    }
+
+private:
+    int single_rule(const exports_entry& record, const char* share_path, RuleTexts& texts)
+    {
         // A file of one unparsable line (or of one line without its newline): the
         // message goes to standard output, which is the answer, in the middle of the
         // share's nfs element. The page has always received it there, so it stays.
-        if (list->next->volume.empty()) {
+        if (record.volume.empty()) {
             std::puts("Nothing to show.");
             return 0;
         }
-        return examine_rule(*list->next, share_path, root_squash, write, host, resolved_paths) ? 1 : 0;
+        if (compared_text(record, m_resolved_paths) != share_path)
+            return 0;
+        report_rule(record, texts);
+        return 1;
     }
 
-    // The switch is asked once per look-up, not twice per rule and share.
-    const bool tracing = trace_enabled();
-    int found = 0;
-    for (exports_entry* record = list->next.get(); record != nullptr; record = record->next.get()) {
-        if (tracing) {
+    int traced_lookup(const char* share_path, RuleTexts& texts)
+    {
+        const ExportsList list = load_exports_config("/etc/exports");
+        if (!list || !list->next)
+            return 0;
+        if (!list->next->next)
+            return single_rule(*list->next, share_path, texts);
+        int found = 0;
+        for (const exports_entry* record = list->next.get(); record != nullptr; record = record->next.get()) {
             printf_out("path=%s\n", share_path);
             printf_out("current->volume=%s\n", record->volume.c_str());
+            if (compared_text(*record, m_resolved_paths) == share_path) {
+                report_rule(*record, texts);
+                found = 1;
+            }
         }
-        if (examine_rule(*record, share_path, root_squash, write, host, resolved_paths))
-            found = 1;
+        return found;
     }
-    return found;
-}
+
+    bool m_tracing;
+    ExportsList m_list;
+    int m_records = 0;
+    // Resolved once per request: a path resolves the same way throughout it.
+    CanonicalPaths m_resolved_paths;
+    std::unordered_map<std::string, const exports_entry*> m_last_of;
+};
 
 } // namespace
 
@@ -116,7 +149,7 @@ void cgi_get_all_session()
     out("<media_serving>%s</media_serving>", media.c_str());
     out("<webdav_server>%d</webdav_server>", xml_get_int("/system_mgr/webdav/enable") == 1 ? 1 : 0);
 
-    ResolvedPaths resolved_paths;
+    ExportRules rules(trace_enabled());
     int total = 0;
     for (const share_info* share = pss; share != nullptr; share = share->next) {
         out("<share><name>");
@@ -125,14 +158,13 @@ void cgi_get_all_session()
         cgiHtmlEscape(share->path);
         out("</path><nfs>");
 
-        FixedText<8> root_squash;
-        FixedText<8> write;
-        FixedText<64> host;
-        if (nfs_rule_lookup(share->path, root_squash, write, host, resolved_paths) == 1) {
+        RuleTexts texts;
+        if (rules.lookup(share->path, texts) == 1) {
             out("<status>1</status><real_path>");
             cgiHtmlEscape(share->path);
-            out("</real_path><root_squash>%s</root_squash><write>%s</write><host>", root_squash.c_str(), write.c_str());
-            cgiHtmlEscape(host.c_str());
+            out("</real_path><root_squash>%s</root_squash><write>%s</write><host>", texts.root_squash.c_str(),
+                texts.write.c_str());
+            cgiHtmlEscape(texts.host.c_str());
             out("</host>");
         } else {
             out("<status>0</status><real_path>");

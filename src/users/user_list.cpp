@@ -1,8 +1,6 @@
 // The users page: its paged table of accounts, and the totals and names its dialogs need.
 #include <cstdio>
 #include <cstring>
-#include <grp.h>
-#include <pwd.h>
 #include <string>
 #include <strings.h>
 
@@ -15,7 +13,7 @@
 #include "cgi/trace.h"
 #include "platform/config_store.h"
 #include "platform/share.h"
-#include "volumes/password_entries.h"
+#include "volumes/account_names.h"
 #include "volumes/helpers.h"
 #include "volumes/reserved_accounts.h"
 #include "volumes/volume_table.h"
@@ -30,6 +28,7 @@ struct UserFilter {
     bool active;
     // The query anywhere in the text, case-sensitive.
     bool passes(const char* text) const { return !active || std::strstr(text, query.c_str()); }
+    bool passes(std::string_view text) const { return !active || text.find(query.view()) != std::string_view::npos; }
 };
 
 // The device's own accounts, as the domain service reports them ("NETBIOS+name", in
@@ -80,11 +79,11 @@ void list_domain_users(const FixedText<4>& page, FilteredPageCounter& counter, c
 
 void list_local_users(const FixedText<4>& page, FilteredPageCounter& counter, const UserFilter& filter)
 {
-    for_each_password_entry("/etc/passwd", [&](const passwd& entry) {
-        if (is_reserved_user(entry.pw_name))
+    for_each_account_name("/etc/passwd", AccountFile::Passwd, [&](std::string_view entry) {
+        if (is_reserved_user(entry))
             return;
-        if (const int id = counter.offer(filter.passes(entry.pw_name))) {
-            const std::string name = entry.pw_name;
+        if (const int id = counter.offer(filter.passes(entry))) {
+            const std::string name(entry);
             FixedText<55296> groups;
             LIB_Web_Get_User_Join_Group(name.c_str(), groups.data());
             write_grid_row(id, {name.c_str(), groups.c_str()});
@@ -128,21 +127,20 @@ void cgi_get_user_info()
 
     int user_count = 0;
     std::string users;
-    for_each_password_entry("/etc/passwd", [&](const passwd& entry) {
-        if (is_reserved_user(entry.pw_name))
+    for_each_account_name("/etc/passwd", AccountFile::Passwd, [&](std::string_view name) {
+        if (is_reserved_user(name))
             return;
         ++user_count;
-        users += entry.pw_name;
+        users += name;
         users += '#';
     });
     std::string groups;
-    while (const group* entry = getgrent()) {
-        if (is_reserved_group(entry->gr_name))
-            continue;
-        groups += entry->gr_name;
-        groups += '#';
-    }
-    endgrent();
+    for_each_account_name("/etc/group", AccountFile::Group, [&](std::string_view name) {
+        if (!is_reserved_group(name)) {
+            groups += name;
+            groups += '#';
+        }
+    });
     if (!users.empty())
         users.pop_back();
     if (!groups.empty())

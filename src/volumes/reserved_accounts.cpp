@@ -1,11 +1,9 @@
 #include "volumes/reserved_accounts.h"
 
 #include <array>
-#include <grp.h>
-#include <pwd.h>
 #include <string_view>
 
-#include "volumes/password_entries.h"
+#include "volumes/account_names.h"
 
 namespace {
 
@@ -16,7 +14,7 @@ constexpr std::array<std::string_view, 5> kReservedGroups{
     "root", "allaccount", "administrators", "share", "netdev"};
 
 template <std::size_t N>
-bool is_listed_in(const std::array<std::string_view, N>& names, const char* name)
+bool is_listed_in(const std::array<std::string_view, N>& names, std::string_view name)
 {
     for (std::string_view reserved : names) {
         if (reserved == name)
@@ -27,12 +25,12 @@ bool is_listed_in(const std::array<std::string_view, N>& names, const char* name
 
 } // namespace
 
-bool is_reserved_user(const char* name)
+bool is_reserved_user(std::string_view name)
 {
     return is_listed_in(kReservedUsers, name);
 }
 
-bool is_reserved_group(const char* name)
+bool is_reserved_group(std::string_view name)
 {
     return is_listed_in(kReservedGroups, name);
 }
@@ -40,21 +38,19 @@ bool is_reserved_group(const char* name)
 int count_listed_users()
 {
     int count = 0;
-    for_each_password_entry("/etc/passwd", [&](const passwd& entry) {
-        if (!is_reserved_user(entry.pw_name))
+    for_each_account_name("/etc/passwd", AccountFile::Passwd, [&](std::string_view name) {
+        if (!is_reserved_user(name))
             ++count;
     });
-    endpwent();
     return count;
 }
 
 int count_listed_groups()
 {
     int count = 0;
-    while (const group* entry = getgrent()) {
-        if (!is_reserved_group(entry->gr_name))
+    for_each_account_name("/etc/group", AccountFile::Group, [&](std::string_view name) {
+        if (!is_reserved_group(name))
             ++count;
-    }
-    endgrent();
+    });
     return count;
 }

@@ -1,10 +1,12 @@
 // System accounts that the account pages never list or count.
 #pragma once
 
-bool is_reserved_user(const char* name);
-bool is_reserved_group(const char* name);
+#include <string_view>
+
+bool is_reserved_user(std::string_view name);
+bool is_reserved_group(std::string_view name);
 
 // Users of "/etc/passwd" that are not reserved.
 int count_listed_users();
-// Groups of the group database, from its current position, that are not reserved.
+// Groups of "/etc/group" (the device's group database) that are not reserved.
 int count_listed_groups();

@@ -1,0 +1,172 @@
+#include "volumes/account_names.h"
+
+#include <algorithm>
+#include <cerrno>
+#include <cstdint>
+#include <cstring>
+#include <fcntl.h>
+#include <unistd.h>
+
+namespace {
+
+// Large enough that a password file of 50,000 users is a few dozen reads, small
+// enough to stay out of the way of the request's memory.
+constexpr std::size_t kBlockSize = 64 * 1024;
+
+// White space as the C locale's isspace() sees it.
+bool is_blank(char c)
+{
+    return c == ' ' || (c >= '\t' && c <= '\r');
+}
+
+// A number field as the entry readers take it: strtoul()'s text (white space, a sign,
+// digits) whose value, negated when the sign is "-", fits 32 bits, followed by ":" or
+// the end of the line. `compat` also admits an empty field, not a missing one.
+bool take_number(std::string_view& rest, bool compat)
+{
+    if (compat && rest.empty())
+        return false;
+    std::size_t i = 0;
+    while (i < rest.size() && is_blank(rest[i]))
+        ++i;
+    const bool negative = i < rest.size() && rest[i] == '-';
+    if (i < rest.size() && (rest[i] == '+' || rest[i] == '-'))
+        ++i;
+    const std::size_t digits = i;
+    std::uint64_t value = 0;
+    bool overflow = false;
+    while (i < rest.size() && rest[i] >= '0' && rest[i] <= '9') {
+        const auto digit = static_cast<std::uint64_t>(rest[i] - '0');
+        overflow = __builtin_mul_overflow(value, 10, &value) || overflow;
+        overflow = __builtin_add_overflow(value, digit, &value) || overflow;
+        ++i;
+    }
+    // Without a digit nothing was converted: the field ends where it began.
+    if (i == digits && !compat)
+        return false;
+    if (i > digits) {
+        if (overflow)
+            value = UINT64_MAX;
+        else if (negative)
+            value = 0 - value;
+        if (value > UINT32_MAX)
+            return false;
+    }
+    const std::size_t end = i > digits ? i : 0;
+    if (end == rest.size()) {
+        rest = {};
+        return true;
+    }
+    if (rest[end] != ':')
+        return false;
+    rest.remove_prefix(end + 1);
+    return true;
+}
+
+} // namespace
+
+std::optional<std::string_view> account_entry_name(AccountLine line, AccountFile kind, std::string& scratch)
+{
+    // The entry readers see C text: it ends at a NUL, and holds the line end only when
+    // no NUL comes before it.
+    std::string_view text = line.text;
+    const void* nul = line.may_hold_nul ? std::memchr(text.data(), '\0', text.size()) : nullptr;
+    if (nul)
+        text = text.substr(0, static_cast<std::size_t>(static_cast<const char*>(nul) - text.data()));
+    const bool holds_line_end = line.ended && !nul;
+
+    std::size_t skip = 0;
+    while (skip < text.size() && is_blank(text[skip]))
+        ++skip;
+    std::string_view entry = text.substr(skip);
+    if (entry.empty() || entry[0] == '#')
+        return std::nullopt;
+    // The readers move the text over the skipped white space without its terminating
+    // NUL: the characters after it, as many as were skipped, stay behind it. A line end
+    // in the text cuts them off; without one they are part of the entry.
+    if (skip > 0 && !holds_line_end) {
+        scratch.assign(entry);
+        scratch.append(text.substr(entry.size(), skip));
+        entry = scratch;
+    }
+
+    const std::size_t colon = entry.find(':');
+    const std::string_view name = entry.substr(0, colon);
+    std::string_view rest = colon == std::string_view::npos ? std::string_view() : entry.substr(colon + 1);
+    const bool compat = !name.empty() && (name[0] == '+' || name[0] == '-');
+    if (compat && rest.empty())
+        return name;
+
+    // The password field, whatever it holds.
+    const std::size_t password_end = rest.find(':');
+    rest = password_end == std::string_view::npos ? std::string_view() : rest.substr(password_end + 1);
+    const int numbers = kind == AccountFile::Passwd ? 2 : 1;
+    for (int i = 0; i < numbers; ++i) {
+        if (!take_number(rest, compat))
+            return std::nullopt;
+    }
+    return name;
+}
+
+AccountLineReader::AccountLineReader(const char* path, AccountFile kind)
+    : m_fd(open(path, O_RDONLY | O_CLOEXEC)), m_colons(kind == AccountFile::Passwd ? 4 : 3)
+{
+}
+
+AccountLineReader::~AccountLineReader()
+{
+    if (m_fd >= 0)
+        close(m_fd);
+}
+
+bool AccountLineReader::refill()
+{
+    if (m_block.empty())
+        m_block.resize(kBlockSize);
+    ssize_t got = 0;
+    do
+        got = read(m_fd, m_block.data(), m_block.size());
+    while (got < 0 && errno == EINTR);
+    m_begin = 0;
+    m_end = got > 0 ? static_cast<std::size_t>(got) : 0;
+    // One look per block spares one per line: account files hold no NUL.
+    m_block_holds_nul = std::memchr(m_block.data(), '\0', m_end) != nullptr;
+    return m_end > 0;
+}
+
+std::optional<AccountLine> AccountLineReader::next()
+{
+    if (m_fd < 0)
+        return std::nullopt;
+    if (m_begin == m_end && !refill())
+        return std::nullopt;
+
+    const char* start = m_block.data() + m_begin;
+    if (const void* newline = std::memchr(start, '\n', m_end - m_begin)) {
+        const auto length = static_cast<std::size_t>(static_cast<const char*>(newline) - start);
+        m_begin += length + 1;
+        return AccountLine{{start, length}, true, m_block_holds_nul};
+    }
+
+    // A line that goes on past the block: keep its head until the entry is decided (the
+    // colons it depends on, or a NUL, are in), skip the rest up to the line end.
+    m_long_line.assign(start, m_end - m_begin);
+    auto colons = static_cast<std::size_t>(std::count(m_long_line.begin(), m_long_line.end(), ':'));
+    bool decided = colons >= m_colons || m_long_line.find('\0') != std::string::npos;
+    while (refill()) {
+        const char* block = m_block.data();
+        const void* newline = std::memchr(block, '\n', m_end);
+        const std::size_t length = newline ? static_cast<std::size_t>(static_cast<const char*>(newline) - block) : m_end;
+        if (!decided) {
+            m_long_line.append(block, length);
+            colons += static_cast<std::size_t>(std::count(block, block + length, ':'));
+            decided = colons >= m_colons || std::memchr(block, '\0', length) != nullptr;
+        }
+        if (newline) {
+            m_begin = length + 1;
+            return AccountLine{m_long_line, true};
+        }
+    }
+    // The last line, without a line end.
+    return AccountLine{m_long_line, false};
+}

@@ -1,0 +1,78 @@
+// The names of the entries of the password and group files, in file order, found as
+// the C library's entry readers (fgetpwent, and getgrent over the files database)
+// find them, but without building a whole entry per line: a device of 50,000 users
+// holds a password file of megabytes and a group line ("allaccount") of half a
+// megabyte, and the pages only need the names.
+//
+// An entry is a line that the readers would return: leading white space is skipped,
+// empty lines and lines starting with "#" are comments, the text ends at a NUL (and
+// a line whose text ends before its line end gets the readers' quirk of a line moved
+// over its leading white space: its last characters twice, as many as were skipped),
+// the numeric fields (uid and gid of a password line, gid of a group line) must hold
+// a number ending at ":" or at the end of the line. A name beginning with "+" or "-"
+// (a name-service compatibility line) is taken with an empty or missing number, and
+// alone on its line. The name is the text before the first ":".
+#pragma once
+
+#include <cstddef>
+#include <optional>
+#include <string>
+#include <string_view>
+
+#include "cgi/file.h"
+
+enum class AccountFile {
+    Passwd,     // NAME:PASSWORD:UID:GID:...
+    Group,      // NAME:PASSWORD:GID:MEMBERS
+};
+
+// One line of the file without its line end; `ended` when a line end followed it,
+// `may_hold_nul` unless the line is known to hold no NUL.
+struct AccountLine {
+    std::string_view text;
+    bool ended = true;
+    bool may_hold_nul = true;
+};
+
+// The name of the entry on one line, or nothing when the entry reader would pass the
+// line over. The name may point into `scratch`.
+std::optional<std::string_view> account_entry_name(AccountLine line, AccountFile kind, std::string& scratch);
+
+// Reads a file line by line in large blocks; of a line longer than a block only the
+// part that decides its entry is kept.
+class AccountLineReader {
+public:
+    AccountLineReader(const char* path, AccountFile kind);
+    explicit operator bool() const { return m_fd >= 0; }
+    // The next line, or its head; nothing at the end of the file.
+    std::optional<AccountLine> next();
+    ~AccountLineReader();
+    AccountLineReader(const AccountLineReader&) = delete;
+    AccountLineReader& operator=(const AccountLineReader&) = delete;
+
+private:
+    bool refill();
+    int m_fd = -1;
+    std::size_t m_colons;       // the colons up to the last field the entry depends on
+    std::string m_block;
+    std::size_t m_begin = 0;
+    std::size_t m_end = 0;
+    bool m_block_holds_nul = false;
+    std::string m_long_line;
+};
+
+// Calls visit(name) (a std::string_view, valid during the call) for each entry of the
+// file, in file order. False when the file cannot be opened.
+template <typename Visit>
+bool for_each_account_name(const char* path, AccountFile kind, Visit visit)
+{
+    AccountLineReader reader(path, kind);
+    if (!reader)
+        return false;
+    std::string scratch;
+    while (const auto line = reader.next()) {
+        if (const auto name = account_entry_name(*line, kind, scratch))
+            visit(*name);
+    }
+    return true;
+}
