@@ -21,7 +21,8 @@
 //                                  in /etc/group order (the account tool's -l format)
 //   LIB_Get_User_First_Group_Name  the name of the user's primary group (at most 63
 //                                  bytes); empty for an unknown user or group id
-// Each call records itself in the journal first; the list helpers and remove_0D_0A,
+// A name, path or account the store cannot hold (share_store.h) is refused with -1
+// and nothing changes. Each call records itself in the journal first; the list helpers and remove_0D_0A,
 // which touch no store, do not.
 #include "platform/share.h"
 
@@ -69,6 +70,8 @@ void copy_cut(char* buffer, const std::string& text, std::size_t size)
 extern "C" int set_default_deny(const char* name)
 {
     journal_record("set_default_deny", {name});
+    if (!is_storable_account(name))
+        return -1;
     std::vector<ShareEntry> shares = load_shares();
     for (ShareEntry& share : shares) {
         bool listed = false;
@@ -93,7 +96,7 @@ extern "C" int add_share(const struct share_record* share)
                                  std::to_string(share->recycle_bin), std::to_string(share->public_access),
                                  std::to_string(share->media_serving), std::to_string(share->remote_access)});
     std::vector<ShareEntry> shares = load_shares();
-    if (share->name[0] == '\0' || find_share(shares, share->name))
+    if (!is_storable_share_name(share->name) || !is_storable_share_path(share->path) || find_share(shares, share->name))
         return -1;
     ShareEntry entry{share->name, share->path, share->read_only, share->browseable, share->recycle_bin,
                      share->public_access, share->media_serving, share->remote_access, {}};
@@ -135,6 +138,10 @@ extern "C" int insert_acnt_node(struct acnt_list* list, const char* name, int ac
 extern "C" int acnt_mod_share(const struct acnt_list* list, int mode)
 {
     journal_record("acnt_mod_share", {list->share, std::to_string(mode)});
+    for (const acnt_node* node = list->head; node; node = node->next) {
+        if (!is_storable_account(node->name))
+            return -1;
+    }
     std::vector<ShareEntry> shares = load_shares();
     ShareEntry* share = find_share(shares, list->share);
     if (!share)
@@ -158,6 +165,8 @@ extern "C" void free_acnt_list(struct acnt_list* list)
 extern "C" int del_share(const char* name)
 {
     journal_record("del_share", {name});
+    if (!is_storable_share_name(name))
+        return -1;
     std::vector<ShareEntry> shares = load_shares();
     std::erase_if(shares, [name](const ShareEntry& share) { return share.name == name; });
     save_shares(shares);
@@ -178,6 +187,8 @@ extern "C" int delete_user_group_name(const char* name)
 extern "C" int change_user_group_name(const char* old_name, const char* new_name)
 {
     journal_record("change_user_group_name", {old_name, new_name});
+    if (!is_storable_account(new_name))
+        return -1;
     const std::string old_group = std::string("@") + old_name;
     std::vector<ShareEntry> shares = load_shares();
     for (ShareEntry& share : shares) {

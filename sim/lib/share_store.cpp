@@ -31,7 +31,39 @@ std::string format_access(const std::vector<std::pair<std::string, int>>& access
     return join(items, ',');
 }
 
+bool has_control_character(std::string_view text)
+{
+    for (const char c : text) {
+        const auto byte = static_cast<unsigned char>(c);
+        if (byte < 0x20 || byte == 0x7f)
+            return true;
+    }
+    return false;
+}
+
 } // namespace
+
+bool is_storable_share_name(std::string_view name)
+{
+    return !name.empty() && name != "." && name != ".." && name.find('/') == std::string_view::npos
+        && !has_control_character(name);
+}
+
+bool is_storable_account(std::string_view account)
+{
+    return account.find_first_of(",:") == std::string_view::npos && !has_control_character(account);
+}
+
+bool is_storable_share_path(std::string_view path)
+{
+    if (path.empty() || path.front() != '/' || has_control_character(path))
+        return false;
+    for (const auto& component : fs::path(std::string(path))) {
+        if (component == "." || component == "..")
+            return false;
+    }
+    return true;
+}
 
 std::vector<ShareEntry> load_shares()
 {
@@ -59,16 +91,23 @@ bool save_shares(const std::vector<ShareEntry>& shares)
 
 void link_share(const ShareEntry& share)
 {
+    if (!is_storable_share_name(share.name) || !is_storable_share_path(share.path))
+        return;
     std::error_code ignored;
     fs::create_directories(share.path, ignored);
     fs::create_directories("/shares", ignored);
     const fs::path link = fs::path("/shares") / share.name;
-    fs::remove(link, ignored);
+    if (fs::is_symlink(link, ignored))
+        fs::remove(link, ignored);
+    else if (fs::exists(link, ignored))
+        return;
     fs::create_symlink(share.path, link, ignored);
 }
 
 void unlink_share(std::string_view name)
 {
+    if (!is_storable_share_name(name))
+        return;
     std::error_code ignored;
     const fs::path link = fs::path("/shares") / std::string(name);
     if (fs::is_symlink(link, ignored))

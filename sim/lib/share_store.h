@@ -26,10 +26,21 @@ struct ShareEntry {
     std::vector<std::pair<std::string, int>> access;
 };
 
+// What the store can hold. A share name is a single path component below /shares: not
+// empty, not "." or "..", no "/" and no control character. An account of an access
+// list holds neither control characters nor the list's own separators "," and ":"
+// (the empty account is stored as it always was).
+// A share path is absolute, without "." or ".." components or control characters.
+// The library refuses anything else and changes nothing.
+bool is_storable_share_name(std::string_view name);
+bool is_storable_account(std::string_view account);
+bool is_storable_share_path(std::string_view path);
+
 std::vector<ShareEntry> load_shares();
 bool save_shares(const std::vector<ShareEntry>& shares);
 
-// Creates the share's folder (and its parents) and points /shares/NAME at it.
+// Creates the share's folder (and its parents) and points /shares/NAME at it; an entry
+// /shares/NAME that is not a link is never replaced.
 void link_share(const ShareEntry& share);
-// Removes /shares/NAME (never the folder).
+// Removes the link /shares/NAME (never the folder, never anything but a link).
 void unlink_share(std::string_view name);

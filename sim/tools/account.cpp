@@ -29,6 +29,7 @@
 #include <cctype>
 #include <cstdlib>
 #include <cstdio>
+#include <cstring>
 #include <ctime>
 #include <optional>
 #include <string>
@@ -48,15 +49,16 @@ int fail(const std::string& message)
     return 1;
 }
 
-// Names as the device's account tools accept them: letters, digits, ".", "_" and
-// "-", not beginning with "-" or ".", at most 32 characters. So no name can hold a
-// "%", which the account pages rely on.
+// Names as the device's account tools refuse them: empty, over 32 bytes, beginning
+// with "." or "-", or holding a control character, "/" or one of the characters
+// \ : * ? " < > | ; , = + [ ] @ % ' $ and the backquote. So no name can
+// hold a "%", a quote or a field separator of the account files.
 bool valid_name(const std::string& name)
 {
     if (name.empty() || name.size() > 32 || name[0] == '-' || name[0] == '.')
         return false;
     for (unsigned char c : name) {
-        if (!std::isalnum(c) && c != '.' && c != '_' && c != '-')
+        if (c < 0x20 || c == 0x7f || std::strchr("/\\:*?\"<>|;,=+[]@%'$`", c) != nullptr)
             return false;
     }
     return true;

@@ -14,6 +14,7 @@
 #include "cgi/handlers.h"
 #include "cgi/response.h"
 #include "cgi/shell.h"
+#include "cgi/text_escape.h"
 #include "cgi/trace.h"
 #include "platform/cgic.h"
 
@@ -44,8 +45,8 @@ void start_import(const char* option, const char* file)
     const char* escaped_overwrite = cgi_escapeshellarg(overwrite.c_str());
 
     FixedText<256> line;
-    line.format("(account_mgr %s -f '%s' -t %s -o %s >/dev/null 2>&1) &", option, file,
-                  escaped_app, escaped_overwrite);
+    line.format("(account_mgr %s -f '%s' -t %s -o %s >/dev/null 2>&1) &", option,
+                inside_single_quotes(file).c_str(), escaped_app, escaped_overwrite);
     cgi_escapeshellarg_free();
     run_system(line.c_str());
     printf_out("buf=[%s]\n", line.c_str());

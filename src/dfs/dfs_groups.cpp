@@ -1,5 +1,6 @@
 // The DFS switch and DFS groups, the named collections of DFS links. There is no
 // command that deletes a group.
+#include "cgi/event_log.h"
 #include "cgi/fixed_text.h"
 #include "cgi/form.h"
 #include "cgi/grid.h"
@@ -9,6 +10,7 @@
 #include "platform/config_store.h"
 #include "platform/flash.h"
 #include "platform/samba.h"
+#include "volumes/names.h"
 
 namespace {
 
@@ -56,6 +58,13 @@ void cgi_set_dfs_group()
     const auto group = form_value<128>("group");
     const auto old_group = form_value<128>("old_group");
     const auto flag = form_value<8>("flag");
+    // A group name becomes a folder of the DFS tree: one the name rule refuses changes
+    // nothing.
+    if (!is_acceptable_name(group.view()) || (flag != "1" && !is_acceptable_name(old_group.view()))) {
+        log_refusal("cgi_set_dfs_group", is_acceptable_name(group.view()) ? "old_group" : "group");
+        answer_empty_html();
+        return;
+    }
 
     if (flag == "1")
         add_dfs_group_node(group.c_str());

@@ -1,6 +1,10 @@
 // DFS links: each points at a folder that another host shares and belongs to one DFS
 // group. The records live in the Samba library; after every change the links are
 // rebuilt and the configuration is copied to flash.
+#include <initializer_list>
+#include <utility>
+
+#include "cgi/event_log.h"
 #include "cgi/fixed_text.h"
 #include "cgi/form.h"
 #include "cgi/grid.h"
@@ -8,12 +12,27 @@
 #include "cgi/response.h"
 #include "platform/flash.h"
 #include "platform/samba.h"
+#include "volumes/names.h"
 
 namespace {
 
 // What the flash copy saves after a link change, and after a link deletion.
 constexpr int kSaveDfsChange = 0x6000000;
 constexpr int kSaveDfsDeletion = 0x4000000;
+
+// A link's host, name and group become parts of the DFS tree's paths: a value the name
+// rule refuses changes nothing (the first one found is named in the warning).
+bool refuses(const char* command, std::initializer_list<std::pair<const char*, const char*>> fields)
+{
+    for (const auto& [field, value] : fields) {
+        if (!is_acceptable_name(value)) {
+            log_refusal(command, field);
+            answer_empty_html();
+            return true;
+        }
+    }
+    return false;
+}
 
 } // namespace
 
@@ -23,6 +42,8 @@ void cgi_set_dfs()
     const auto sharename = form_value<128>("sharename");
     const auto path = form_value<1024>("path");
     const auto group = form_value<128>("group");
+    if (refuses("cgi_set_dfs", {{"host", host.c_str()}, {"sharename", sharename.c_str()}, {"group", group.c_str()}}))
+        return;
 
     // A new link does not switch DFS on; only a group change does.
     add_dfs_node(host.c_str(), path.c_str(), sharename.c_str(), group.c_str());
@@ -40,6 +61,9 @@ void cgi_modify_dfs()
     const auto group = form_value<128>("group");
     const auto old_share = form_value<128>("old_share");
     const auto old_group = form_value<128>("old_group");
+    if (refuses("cgi_modify_dfs", {{"host", host.c_str()}, {"sharename", sharename.c_str()}, {"group", group.c_str()},
+                                   {"old_share", old_share.c_str()}, {"old_group", old_group.c_str()}}))
+        return;
 
     mod_dfs_node(host.c_str(), path.c_str(), sharename.c_str(), group.c_str(), old_share.c_str(),
                  old_group.c_str());
@@ -52,6 +76,8 @@ void cgi_del_dfs()
 {
     const auto group = form_value<128>("group");
     const auto local = form_value<128>("local");
+    if (refuses("cgi_del_dfs", {{"group", group.c_str()}, {"local", local.c_str()}}))
+        return;
 
     del_dfs_node(local.c_str(), group.c_str());
     create_dfs_link();

@@ -10,6 +10,7 @@
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <string>
 
 #include "cgi/file.h"
 #include "cgi/fixed_text.h"
@@ -17,6 +18,7 @@
 #include "cgi/handlers.h"
 #include "cgi/response.h"
 #include "cgi/shell.h"
+#include "cgi/text_escape.h"
 #include "cgi/trace.h"
 #include "platform/cgic.h"
 #include "platform/config_store.h"
@@ -49,13 +51,14 @@ bool join_succeeded(int status)
     return status == 1 || status == 50 || status == 100;
 }
 
-// Puts three DNS servers back as the LAN's; config values, not escaped. The trace is
+// Puts three DNS servers back as the LAN's. The config values stand inside the line's
+// double quotes, escaped for them (a page filled them). The trace is
 // "set old dns1 to xml cmd1=[...]" after a leave, "...cmd2=[...]" after a failure.
 void restore_dns(const char* dns1, const LanDns& lan, int trace_number)
 {
     FixedText<kCommandLineSize> line;
-    line.format("network -x \"%s\" -D \"%s %s %s\" >/dev/null 2>&1", "0", dns1,
-                  lan.dns2.c_str(), lan.dns3.c_str());
+    line.format("network -x \"%s\" -D \"%s %s %s\" >/dev/null 2>&1", "0", inside_double_quotes(dns1).c_str(),
+                inside_double_quotes(lan.dns2.view()).c_str(), inside_double_quotes(lan.dns3.view()).c_str());
     printf_out("set old dns1 to xml cmd%d=[%s]\n", trace_number, line.c_str());
     run_system(line.c_str());
 }
@@ -74,8 +77,15 @@ bool first_line_of(const char* command, FixedText<512>& line, bool trace_workgro
     if (!pipe)
         return false;
     read_line(pipe.get(), line);
-    if (trace_workgroup)
-        printf_out("workgroup=[%s]\n", line.c_str());
+    if (trace_workgroup && trace_enabled()) {
+        // The line keeps the line end it was read with, as the trace always showed it;
+        // anything else in it that would start a line is escaped.
+        std::string text(line.view());
+        const bool line_end = !text.empty() && text.back() == '\n';
+        if (line_end)
+            text.pop_back();
+        printf_out_text(("workgroup=[" + one_line(text) + (line_end ? "\n" : "") + "]\n").c_str());
+    }
     // Only the last character goes; an empty line stays empty.
     if (const std::size_t length = line.length(); length > 0)
         line[length - 1] = '\0';

@@ -15,12 +15,23 @@
 #include "platform/ftp.h"
 #include "platform/quota.h"
 #include "platform/share.h"
+#include "volumes/names.h"
+#include "volumes/reserved_accounts.h"
 
-// No name is checked here (reserved or existing): the account tool decides.
+// Whether an existing group is decided by the account tool; only a name that can
+// never be a group, a reserved group, or a member list naming a reserved user is
+// refused here (nothing is created).
 void cgi_group_add()
 {
     const auto group = form_value<64>("group");
     const auto member = form_value<55296>("member");
+    if (!is_acceptable_name(group.view()) || is_reserved_group(group.c_str())
+        || lists_reserved_user(member.c_str())) {
+        log_refusal("cgi_group_add", is_acceptable_name(group.view()) && !is_reserved_group(group.c_str())
+                                         ? "member" : "group");
+        answer_empty_html();
+        return;
+    }
 
     run_shell_command("account -a -g %s -l %s", cgi_escapeshellarg(group.c_str()),
                       cgi_escapeshellarg(member.c_str()));
@@ -48,7 +59,16 @@ void cgi_group_del()
 
     LIB_WEB_STOP_FTP();
     char* rest = nullptr;
+    bool first_deletable = true;
     for (char* name = strtok_r(names.data(), ",", &rest); name; name = strtok_r(nullptr, ",", &rest)) {
+        // A name that can never be a group, or a reserved group, is skipped with a
+        // warning; the others are deleted.
+        if (!is_acceptable_name(name) || is_reserved_group(name)) {
+            log_refusal("cgi_group_del", "group");
+            if (name == names.data())
+                first_deletable = false;
+            continue;
+        }
         // The members' entries are kept for the platform's quota tools, which read the
         // file after the group is gone. A name that is no group has no id to look for,
         // so it gets no file.
@@ -67,8 +87,9 @@ void cgi_group_del()
         LIB_FTP_Del_Group(name);
         // Always the start of the split buffer, that is the FIRST name of the list,
         // once per deleted group. The platform's clean-up has always been called so;
-        // do not pass `name` here.
-        delete_user_group_name(names.c_str());
+        // do not pass `name` here. A refused first name is never handed on.
+        if (first_deletable)
+            delete_user_group_name(names.c_str());
     }
     LIB_Rejoin_Other_Group_Quota();
     LIB_WEB_START_FTP();

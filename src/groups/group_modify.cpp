@@ -1,6 +1,7 @@
 // Changing a group's quotas, members or name, one per request.
 #include <cstdlib>
 
+#include "cgi/event_log.h"
 #include "cgi/fixed_text.h"
 #include "cgi/form.h"
 #include "cgi/handlers.h"
@@ -13,6 +14,8 @@
 #include "platform/quota.h"
 #include "platform/share.h"
 #include "volumes/internal_volumes.h"
+#include "volumes/names.h"
+#include "volumes/reserved_accounts.h"
 
 namespace {
 
@@ -32,6 +35,29 @@ void rename_group(const FixedText<64>& old_name, const FixedText<64>& new_name)
     run_system("afpcom >/dev/null 2>&1");
 }
 
+// The field whose value this change may not take, or null. A name that can never be
+// a group is refused for every type; a reserved group is never renamed (onto or away
+// from) and its members never change, nor does a member list name a reserved user.
+// Quotas stay the quota library's business.
+const char* refused_field(long mtype, const FixedText<64>& group, const FixedText<64>& old_group,
+                          const char* member)
+{
+    if (!is_acceptable_name(group.view()))
+        return "group";
+    switch (mtype) {
+    case 2:
+        if (is_reserved_group(group.c_str()))
+            return "group";
+        return lists_reserved_user(member) ? "member" : nullptr;
+    case 3:
+        if (is_reserved_group(group.c_str()))
+            return "group";
+        return !is_acceptable_name(old_group.view()) || is_reserved_group(old_group.c_str()) ? "oldGroup" : nullptr;
+    default:
+        return nullptr;
+    }
+}
+
 } // namespace
 
 void cgi_modify_group()
@@ -42,7 +68,13 @@ void cgi_modify_group()
     const VolumeLimitFields available = read_volume_limit_fields();
     const auto old_group = form_value<64>("oldGroup");
 
-    switch (std::strtol(mtype.c_str(), nullptr, 10)) {
+    const long type = std::strtol(mtype.c_str(), nullptr, 10);
+    if (const char* field = refused_field(type, group, old_group, member.c_str())) {
+        log_refusal("cgi_modify_group", field);
+        answer_empty_html();
+        return;
+    }
+    switch (type) {
     case 1:
         set_internal_volume_limits(group.c_str(), available, LIB_Set_Group_Quota);
         break;

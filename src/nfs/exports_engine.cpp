@@ -6,10 +6,12 @@
 #include <memory>
 #include <mntent.h>
 #include <new>
+#include <string>
 #include <unistd.h>
 
 #include "cgi/file.h"
 #include "cgi/shell.h"
+#include "cgi/text_escape.h"
 #include "cgi/trace.h"
 #include "nfs/exports_parser.h"
 #include "platform/cgic.h"
@@ -47,6 +49,15 @@ bool is_usb_folder(const FixedText<4096>& folder)
 bool is_iso_folder(const FixedText<4096>& folder)
 {
     return std::strncmp(folder.c_str(), "/mnt/isoMount/", 14) == 0;
+}
+
+// A trace that shows a formatted export line, whose own line end stays; the values
+// around it are escaped by the caller.
+template <std::size_t N>
+void trace_export_line(const std::string& before, const FixedText<N>& line, const char* after)
+{
+    if (trace_enabled())
+        printf_out_text((before + line.c_str() + after).c_str());
 }
 
 void write_text(FILE* file, const char* text)
@@ -90,7 +101,7 @@ int modify_usb_exports(const FixedText<4096>& folder_realp, const char* host, co
     make_config_string(folder_realp.c_str(), newip != nullptr ? newip : host, rw, root_squash, line, 1);
     write_text(file.get(), line.c_str());
     file.reset();
-    printf_out("write to USB hidden conf file, bufs\n[%s]\n\n", line.c_str());
+    trace_export_line("write to USB hidden conf file, bufs\n[", line, "]\n\n");
     return 0;
 }
 
@@ -168,7 +179,8 @@ int modify_config_string_base(const char* folder, const char* host, const char* 
         record->root_squash = root_squash;
         make_config_string(record->volume.c_str(), record->ip.c_str(), record->rw, record->root_squash, line, 0);
         write_text(file.get(), line.c_str());
-        printf_out("%s %s found!!!\nwrite buf\n[%s]\n\n", folder_realp.c_str(), host, line.c_str());
+        trace_export_line(one_line(folder_realp.view()) + " " + one_line(host) + " found!!!\nwrite buf\n[", line,
+                          "]\n\n");
     }
 
     if (found)
@@ -182,8 +194,9 @@ int modify_config_string_base(const char* folder, const char* host, const char* 
     } else {
         make_config_string(folder_realp.c_str(), host, rw, root_squash, line, 0);
         write_text(file.get(), line.c_str());
-        printf_out("write new folder_realp[%s] host[%s]\n write buf\n[%s]\n\n", folder_realp.c_str(), host,
-                   line.c_str());
+        trace_export_line("write new folder_realp[" + one_line(folder_realp.view()) + "] host[" + one_line(host)
+                              + "]\n write buf\n[",
+                          line, "]\n\n");
     }
     file.reset();
     follow_up_new_rule(folder_realp);
@@ -297,7 +310,7 @@ int modify_hidden_config_string_base(const char* folder, const char* host, const
         record->root_squash = root_squash;
         make_config_string(full_path.c_str(), record->ip.c_str(), record->rw, record->root_squash, line, 1);
         write_text(file.get(), line.c_str());
-        printf_out("found!! hidden write bufs\n[%s]\n", line.c_str());
+        trace_export_line("found!! hidden write bufs\n[", line, "]\n");
     }
 
     if (!found) {
@@ -312,8 +325,9 @@ int modify_hidden_config_string_base(const char* folder, const char* host, const
         } else {
             make_config_string(folder_realp.c_str(), host, rw, root_squash, line, 1);
             write_text(file.get(), line.c_str());
-            printf_out("write new hidden, folder_realp[%s] host[%s]\n write buf\n[%s]\n\n", folder_realp.c_str(),
-                       host, line.c_str());
+            trace_export_line("write new hidden, folder_realp[" + one_line(folder_realp.view()) + "] host["
+                                  + one_line(host) + "]\n write buf\n[",
+                              line, "]\n\n");
         }
     }
     file.reset();

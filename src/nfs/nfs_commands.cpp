@@ -2,6 +2,7 @@
 // and the removal of a share from every file service at once.
 #include <cstdlib>
 
+#include "cgi/event_log.h"
 #include "cgi/file.h"
 #include "cgi/fixed_text.h"
 #include "cgi/form.h"
@@ -10,12 +11,14 @@
 #include "cgi/service.h"
 #include "cgi/shell.h"
 #include "cgi/trace.h"
+#include "nfs/export_checks.h"
 #include "nfs/exports_engine.h"
 #include "platform/config_store.h"
 #include "platform/flash.h"
 #include "platform/ftp.h"
 #include "platform/share.h"
 #include "platform/storage.h"
+#include "volumes/names.h"
 
 // Exports the folder to the host in "/etc/exports" and in the folder's second store,
 // then has the NFS server reread its rules. Only bit 0 of "rw" decides the access, and
@@ -28,6 +31,13 @@ void cgi_set_nfs_share()
     const auto rootsquash = form_value<8>("rootsquash");
     const int read_write = std::atoi(rw.c_str());
     const int root_squash = std::atoi(rootsquash.c_str());
+    // A host outside the exports grammar, or a folder outside the volumes or one that
+    // would break its line, leaves every exports file as it is.
+    if (!is_export_host(host.view()) || !is_export_folder(path.c_str())) {
+        log_refusal("cgi_set_nfs_share", is_export_host(host.view()) ? "path" : "host");
+        answer_empty_html();
+        return;
+    }
 
     add_config_string(path.c_str(), host.c_str(), read_write, root_squash);
     add_hidden_config_string(path.c_str(), host.c_str(), read_write, root_squash);
@@ -88,6 +98,13 @@ void cgi_del_session()
     printf_out("path=[%s]\n", path.c_str());
     printf_out("host=[%s]\n", host.c_str());
     printf_out("smb_path=[%s]\n", smb_path.c_str());
+    // A share name that would leave "/shares", or a folder outside the volumes,
+    // changes nothing.
+    if (!is_acceptable_name(name.view()) || !is_export_folder(path.c_str())) {
+        log_refusal("cgi_del_session", is_acceptable_name(name.view()) ? "path" : "name");
+        answer_empty_html();
+        return;
+    }
 
     del_share(name.c_str());
 

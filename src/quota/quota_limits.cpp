@@ -42,7 +42,7 @@ void write_quota_answer_header()
 void trace_single_volume_query(const char* heading, const FixedText<8>& hdd, const FixedText<64>& name,
                                const VolumePaths& paths, unsigned long long value)
 {
-    printf_out("%s", heading);
+    printf_out_text(heading);
     printf_out("hdd=%s\n", hdd.c_str());
     printf_out("name=%s\n", name.c_str());
     printf_out("path1=%s\n", device_dir_of(paths[0]));

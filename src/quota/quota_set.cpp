@@ -3,12 +3,14 @@
 // bounds the pages show beside the boxes are not checked here.
 #include <array>
 
+#include "cgi/event_log.h"
 #include "cgi/form.h"
 #include "cgi/handlers.h"
 #include "cgi/response.h"
 #include "cgi/trace.h"
 #include "platform/quota.h"
 #include "volumes/internal_volumes.h"
+#include "volumes/names.h"
 
 namespace {
 
@@ -22,6 +24,13 @@ void set_quota(Owner owner)
     const VolumeLimitFields available = read_volume_limit_fields();
 
     const VolumePaths paths = map_internal_volume_paths();
+
+    // A name that can never be an account reaches no quota store.
+    if (!is_acceptable_name(name.view())) {
+        log_refusal(owner == Owner::User ? "cgi_user_set_quota" : "cgi_group_set_quota", "name");
+        answer_empty_html();
+        return;
+    }
 
     if (owner == Owner::User) {
         printf_out("path1=%s\n", device_dir_of(paths[0]));

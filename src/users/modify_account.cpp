@@ -4,6 +4,7 @@
 #include <grp.h>
 #include <pwd.h>
 
+#include "cgi/event_log.h"
 #include "cgi/fixed_text.h"
 #include "cgi/form.h"
 #include "cgi/handlers.h"
@@ -19,6 +20,8 @@
 #include "users/admin_password.h"
 #include "volumes/helpers.h"
 #include "volumes/internal_volumes.h"
+#include "volumes/names.h"
+#include "volumes/reserved_accounts.h"
 
 namespace {
 
@@ -109,6 +112,32 @@ void replace_group_list(const FixedText<64>& username, const FixedText<1024>& gr
     run_system("account");
 }
 
+// Whether the change of this type may be made to this user: never for a name that can
+// never be an account; for a reserved account, no rename (onto or away from it), no
+// change of its groups and no password but the administrator's own change, which
+// needs the old password.
+bool may_change(long mtype, const FixedText<64>& username, const FixedText<64>& old_name)
+{
+    if (!is_acceptable_name(username.view()))
+        return false;
+    const bool reserved = is_reserved_user(username.c_str());
+    switch (mtype) {
+    case 3:
+        if (!reserved)
+            return true;
+        if (const passwd* account = getpwnam(username.c_str()))
+            return is_protected(account);
+        return true;
+    case 4:
+    case 9:
+        return !reserved;
+    case 7:
+        return !reserved && is_acceptable_name(old_name.view()) && !is_reserved_user(old_name.c_str());
+    default:
+        return true;
+    }
+}
+
 } // namespace
 
 // The edit page sends one request per changed property, chosen by "mtype". Every
@@ -132,8 +161,19 @@ void cgi_modify_account()
     printf_out("username=[%s]\n", username.c_str());
     printf_out("description=[%s]\n", description.c_str());
 
+    const long type = std::strtol(mtype.c_str(), nullptr, 10);
+    if (!may_change(type, username, old_name)) {
+        // Nothing changes; the page gets the answer it always gets.
+        log_refusal("cgi_modify_account", type == 7 && is_acceptable_name(username.view())
+                                              && !is_reserved_user(username.c_str()) ? "oldName" : "username");
+        write_xml_header(Charset::Plain);
+        write_xml_prologue();
+        out("<info><status>%d</status></info>\n", 0);
+        return;
+    }
+
     int status = 0;
-    switch (std::strtol(mtype.c_str(), nullptr, 10)) {
+    switch (type) {
     case 1:
         run_shell_command("account -m -u %s -f %s", cgi_escapeshellarg(username.c_str()),
                           cgi_escapeshellarg(description.c_str()));
@@ -177,6 +217,11 @@ void cgi_modify_account()
 void cgi_remove_email()
 {
     const auto username = form_value<64>("username");
+    if (!is_acceptable_name(username.view())) {
+        log_refusal("cgi_remove_email", "username");
+        answer_empty_html();
+        return;
+    }
     run_bounded_command(256, "chfn -o \"%s\" %s", "", cgi_escapeshellarg(username.c_str()));
     cgi_escapeshellarg_free();
     run_system("account >/dev/null");

@@ -20,6 +20,8 @@
 #include "platform/share.h"
 #include "users/users.h"
 #include "volumes/helpers.h"
+#include "volumes/names.h"
+#include "volumes/reserved_accounts.h"
 #include "volumes/volume_table.h"
 
 namespace {
@@ -124,6 +126,14 @@ void cgi_user_add()
 
     const bool wizard = type == "wizard";
     const bool becomes_admin = std::strtol(is_admin.c_str(), nullptr, 10) == 1;
+    // A name that can never be an account, or a reserved one, is refused like a name
+    // with shell metacharacters. The wizard may keep the administrator's own name.
+    const bool keeps_admin_name = wizard && becomes_admin && name == "admin";
+    if (!is_acceptable_name(name.view()) || (is_reserved_user(name.c_str()) && !keeps_admin_name)) {
+        log_refusal("cgi_user_add", "name");
+        answer_empty_html();
+        return;
+    }
     if (!wizard) {
         run_shell_command("account -a -u %s -p %s -l %s -f %s -h %s -e %s", cgi_escapeshellarg(name.c_str()),
                           cgi_escapeshellarg(password.c_str()), cgi_escapeshellarg(group.c_str()),

@@ -8,10 +8,27 @@
 #include "cgi/response.h"
 #include "cgi/service.h"
 #include "cgi/shell.h"
+#include "cgi/text_escape.h"
 #include "platform/flash.h"
 #include "platform/ftp.h"
 #include "platform/quota.h"
 #include "platform/share.h"
+#include "volumes/names.h"
+#include "volumes/reserved_accounts.h"
+
+namespace {
+
+// A name that can never be an account, or a reserved account, is skipped with a
+// warning; the others are deleted.
+bool deletable(const char* user)
+{
+    if (is_acceptable_name(user) && !is_reserved_user(user))
+        return true;
+    log_refusal("cgi_user_del", "name");
+    return false;
+}
+
+} // namespace
 
 // "name" lists the users separated by commas; a run of commas counts as one. No step
 // looks at a result: an unknown name still gets its event, quota and FTP calls.
@@ -21,10 +38,16 @@ void cgi_user_del()
 
     LIB_WEB_STOP_FTP();
     char* rest = nullptr;
+    bool first_deletable = true;
     for (char* user = strtok_r(names.data(), ",", &rest); user; user = strtok_r(nullptr, ",", &rest)) {
-        // The name stands inside single quotes unescaped: the page only offers names
-        // of existing accounts, and a quote in one breaks only its own line.
-        run_shell_command("account -d -u '%s'", user);
+        const bool is_first = user == names.data();
+        if (!deletable(user)) {
+            if (is_first)
+                first_deletable = false;
+            continue;
+        }
+        // The name stands inside the line's single quotes; a quote in it is escaped.
+        run_shell_command("account -d -u '%s'", inside_single_quotes(user).c_str());
         log_event("Account \"%s\" has been deleted.", user);
         // Every volume slot is cleared, whether or not the volume exists.
         LIB_Set_User_Quota("HD_a2", user, 0);
@@ -34,8 +57,9 @@ void cgi_user_del()
         LIB_FTP_Del_User(user);
         // Always the start of the split buffer, that is the FIRST name of the list,
         // once per listed user. The platform's clean-up has always been called so;
-        // do not pass `user` here.
-        delete_user_group_name(names.c_str());
+        // do not pass `user` here. A refused first name is never handed on.
+        if (first_deletable)
+            delete_user_group_name(names.c_str());
     }
     LIB_WEB_START_FTP();
     reload_share_services();

@@ -1,8 +1,10 @@
 #include "volumes/internal_volumes.h"
 
+#include <algorithm>
 #include <cstdio>
 #include <cstdlib>
 #include <cstring>
+#include <limits>
 
 #include "cgi/file.h"
 #include "cgi/form.h"
@@ -43,9 +45,12 @@ VolumePaths map_internal_volume_paths()
 
 long long kilobytes_from_megabytes(const char* megabytes)
 {
-    const long long value = std::strtoll(megabytes, nullptr, 10);
-    // Shifted as the bits of the signed value: out-of-range values wrap, never trap.
-    return static_cast<long long>(static_cast<unsigned long long>(value) << 10);
+    // A number whose kilobytes a 64-bit value cannot hold is held at the largest (or
+    // smallest) whole megabyte that fits: a limit never wraps into another one.
+    constexpr long long kMost = std::numeric_limits<long long>::max() >> 10;
+    constexpr long long kLeast = std::numeric_limits<long long>::min() >> 10;
+    const long long value = std::clamp(std::strtoll(megabytes, nullptr, 10), kLeast, kMost);
+    return value * 1024;
 }
 
 VolumeLimitFields read_volume_limit_fields()

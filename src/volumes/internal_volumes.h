@@ -37,7 +37,8 @@ inline constexpr int kQuotaVolumes = 4;
 // A quota size as the pages send it (megabytes) in the quota library's kilobytes: the
 // base-10 value of the text, shifted left by 10 bits as a signed 64-bit number.
 // Trailing text is ignored ("100MB" is 100), text without leading digits (an empty or
-// missing field) is 0, which means no limit, and a negative value stays negative.
+// missing field) is 0, which means no limit, and a negative value stays negative. A
+// value beyond what 64 bits of kilobytes hold is held at the nearest one that fits.
 long long kilobytes_from_megabytes(const char* megabytes);
 
 // The form fields "available1" to "available4": the new limits in megabytes on

@@ -23,7 +23,30 @@ bool is_listed_in(const std::array<std::string_view, N>& names, std::string_view
     return false;
 }
 
+template <std::size_t N>
+bool lists_any_of(const std::array<std::string_view, N>& names, const char* list)
+{
+    std::string_view rest(list);
+    while (!rest.empty()) {
+        const std::size_t comma = rest.find(',');
+        const std::string_view item = rest.substr(0, comma);
+        for (std::string_view reserved : names) {
+            if (reserved == item)
+                return true;
+        }
+        if (comma == std::string_view::npos)
+            break;
+        rest.remove_prefix(comma + 1);
+    }
+    return false;
+}
+
 } // namespace
+
+bool lists_reserved_user(const char* list)
+{
+    return lists_any_of(kReservedUsers, list);
+}
 
 bool is_reserved_user(std::string_view name)
 {

@@ -60,8 +60,9 @@ TEST(SetQuota, CutsTheNameAndValuesToTheirBuffers)
     Device dev;
     const std::string long_name(80, 'n');
     dev.request("cgi_user_set_quota", quota_form(long_name, {"1" + std::string(70, '0'), "2"}));
-    // 63 characters of each; the value is beyond 64 bits: the largest, shifted.
-    EXPECT_EQ(dev.journal(), (Journal{{"LIB_Set_User_Quota", "HD_a2", long_name.substr(0, 63), "-1024"},
+    // 63 characters of each; the value is beyond 64 bits: the largest megabyte count
+    // whose kilobytes 64 bits hold, never a wrapped one.
+    EXPECT_EQ(dev.journal(), (Journal{{"LIB_Set_User_Quota", "HD_a2", long_name.substr(0, 63), "9223372036854774784"},
                                       {"LIB_Set_User_Quota", "HD_b2", long_name.substr(0, 63), "2048"}}));
 }
 

@@ -53,13 +53,13 @@ TEST(UserDel, DeletesEachListedUser)
     }
 }
 
-TEST(UserDel, AQuoteBreaksOnlyItsOwnLine)
+TEST(UserDel, AQuoteStaysInsideItsWord)
 {
     Device dev;
     dev.request("cgi_user_del", {{"name", "o'neil,bob"}});
     const auto lines = shell_lines(dev.journal());
     ASSERT_GE(lines.size(), 2u);
-    EXPECT_EQ(lines[0], "account -d -u 'o'neil'");
+    EXPECT_EQ(lines[0], "account -d -u 'o'\\''neil'");
     EXPECT_EQ(lines[1], "account -d -u 'bob'");
     EXPECT_EQ(account_line(dev, "/etc/passwd", "bob"), "(none)");
 }

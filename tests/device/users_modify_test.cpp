@@ -39,8 +39,8 @@ TEST(ModifyAccount, ChangesOnePropertyByType)
          ran("account -m -u 'alice' -x '2030-12-31'")},
         {"9: a group list", {{"mtype", "9"}, {"username", "alice"}, {"group", "office,family"}},
          ran("account -m -u 'alice' -l 'office,family'")},
-        {"9: no list leaves the administrators", {{"mtype", "9"}, {"username", "admin"}},
-         concat({ran("gpasswd -d 'admin' administrators >/dev/null"), ran("usermod -g 1000 'admin' >/dev/null"),
+        {"9: no list leaves the administrators", {{"mtype", "9"}, {"username", "carol"}},
+         concat({ran("gpasswd -d 'carol' administrators >/dev/null"), ran("usermod -g 1000 'carol' >/dev/null"),
                  ran("account")})},
         {"6 changes nothing", {{"mtype", "6"}, {"username", "alice"}, {"description", "x"}}, {}},
         {"no type changes nothing", {{"username", "alice"}, {"description", "x"}}, {}},
@@ -69,9 +69,10 @@ TEST(ModifyAccount, TheAccountFilesChange)
     EXPECT_EQ(account_field(dev, "/etc/shadow", "alice", 7), "22279");
     dev.request("cgi_remove_email", {{"username", "alice"}});
     EXPECT_EQ(account_line(dev, "/etc/passwd", "alice"), "alice:x:1001:1000:Alice L.,,,,:/shares/alice:/bin/sh");
-    dev.request("cgi_modify_account", {{"mtype", "9"}, {"username", "admin"}});
-    EXPECT_EQ(account_line(dev, "/etc/passwd", "admin"), "admin:x:500:1000:Administrator,,,,:/shares:/bin/sh");
-    EXPECT_EQ(account_line(dev, "/etc/group", "administrators"), "administrators:x:1001:");
+    dev.request("cgi_modify_account", {{"mtype", "4"}, {"username", "carol"}, {"group", "administrators"}});
+    dev.request("cgi_modify_account", {{"mtype", "9"}, {"username", "carol"}});
+    EXPECT_EQ(account_line(dev, "/etc/passwd", "carol"), "carol:x:1003:1000:Carol,,,,:/shares/carol:/bin/sh");
+    EXPECT_EQ(account_line(dev, "/etc/group", "administrators"), "administrators:x:1001:admin");
 }
 
 TEST(ModifyAccount, RenamesOnlyFromAnExistingUserAndFollowsUpOnSuccess)
@@ -82,8 +83,8 @@ TEST(ModifyAccount, RenamesOnlyFromAnExistingUserAndFollowsUpOnSuccess)
                  {{"isoMount_user_rename", "alice", "alicia"}, {"change_user_group_name", "alice", "alicia"},
                   {"LIB_FTP_Change_User_Group", "0", "alice", "alicia"}, {"sh", "-c", "makedav start  > /dev/null 2>&1 &"}},
                  ran("afpcom >/dev/null 2>&1")})},
-        {"the tool refuses the new name: it does not resolve, no follow-up", "alice", "al ice",
-         ran("account -u 'alice' -n 'al ice'")},
+        {"the tool refuses the new name: it does not resolve, no follow-up", "alice", "al;ice",
+         ran("account -u 'alice' -n 'al;ice'")},
         {"no such old name: nothing runs", "zed", "zoe", {}},
     };
     for (const auto& c : cases) {
