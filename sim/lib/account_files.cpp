@@ -85,10 +85,14 @@ void set_group_members(ColonRow& group_row, const std::vector<std::string>& memb
 
 bool is_member(const ColonRow& group_row, std::string_view user)
 {
+    return group_row.size() > 3 && member_text_lists(group_row[3], user);
+}
+
+bool member_text_lists(std::string_view text, std::string_view user)
+{
     // Scans the member text without splitting it: allaccount lists every user.
-    if (group_row.size() <= 3 || group_row[3].empty())
+    if (text.empty())
         return false;
-    const std::string_view text = group_row[3];
     std::size_t begin = 0;
     while (begin <= text.size()) {
         const auto end = std::min(text.find(',', begin), text.size());

@@ -59,6 +59,8 @@ inline constexpr std::size_t kGecosOther = 4;
 // Members of a group row, and the row with these members.
 std::vector<std::string> group_members(const ColonRow& group_row);
 void set_group_members(ColonRow& group_row, const std::vector<std::string>& members);
+// True when the comma-separated member text names the user.
+bool member_text_lists(std::string_view members, std::string_view user);
 bool is_member(const ColonRow& group_row, std::string_view user);
 
 // The groups that list `user` as a member, other than allaccount, comma-separated in

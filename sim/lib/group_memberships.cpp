@@ -118,17 +118,7 @@ std::vector<Membership> read_memberships(int fd)
 
 bool lists_member(const Membership& row, std::string_view user)
 {
-    if (!row.has_members_field || row.members.empty())
-        return false;
-    const std::string_view text = row.members;
-    std::size_t begin = 0;
-    while (begin <= text.size()) {
-        const auto end = std::min(text.find(',', begin), text.size());
-        if (text.substr(begin, end - begin) == user)
-            return true;
-        begin = end + 1;
-    }
-    return false;
+    return row.has_members_field && member_text_lists(row.members, user);
 }
 
 struct CachedMemberships {
