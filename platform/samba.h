@@ -5,10 +5,11 @@
 extern "C" {
 #endif
 
-// The share list that get_samba_info2() fills, in the library's stable order.
+// The share list that get_samba_info2() fills, in the library's stable order. The
+// path (at most 4095 characters) is held by the record itself, after its fields.
 struct share_info {
     char name[80];
-    char path[4096];
+    char* path;
     struct share_info* next;
 };
 extern struct share_info* pss;
