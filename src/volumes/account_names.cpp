@@ -63,6 +63,34 @@ bool take_number(std::string_view& rest, bool compat)
     return true;
 }
 
+// The number fields of a well-formed line, each a few digits ending at ":" (or at
+// the end of the line): nothing for take_number() to weigh. False, with `rest` as it
+// was, for any other text, which take_number() then reads.
+bool take_plain_numbers(std::string_view& rest, int numbers)
+{
+    const char* at = rest.data();
+    const char* const end = at + rest.size();
+    for (int field = 0; field < numbers; ++field) {
+        // At most nine digits: the value fits 32 bits without a look.
+        const char* const digits = at;
+        const char* const most = digits + std::min<std::ptrdiff_t>(end - digits, 10);
+        while (at < most && static_cast<unsigned char>(*at - '0') < 10)
+            ++at;
+        if (at == digits || at - digits > 9)
+            return false;
+        if (at == end) {
+            if (field + 1 < numbers)
+                return false;
+            rest = {};
+            return true;
+        }
+        if (*at++ != ':')
+            return false;
+    }
+    rest.remove_prefix(static_cast<std::size_t>(at - rest.data()));
+    return true;
+}
+
 } // namespace
 
 std::optional<std::string_view> account_entry_name(AccountLine line, AccountFile kind, std::string& scratch)
@@ -101,6 +129,8 @@ std::optional<std::string_view> account_entry_name(AccountLine line, AccountFile
     const std::size_t password_end = rest.find(':');
     rest = password_end == std::string_view::npos ? std::string_view() : rest.substr(password_end + 1);
     const int numbers = kind == AccountFile::Passwd ? 2 : 1;
+    if (!compat && take_plain_numbers(rest, numbers))
+        return name;
     for (int i = 0; i < numbers; ++i) {
         if (!take_number(rest, compat))
             return std::nullopt;
@@ -134,6 +164,26 @@ bool AccountLineReader::refill()
     return m_end > 0;
 }
 
+bool AccountLineReader::keep_head(const char* piece, std::size_t length, std::size_t& colons)
+{
+    const void* nul = m_block_holds_nul ? std::memchr(piece, '\0', length) : nullptr;
+    const std::size_t searched = nul ? static_cast<std::size_t>(static_cast<const char*>(nul) - piece) : length;
+    std::size_t at = 0;
+    while (colons < m_colons) {
+        const void* colon = std::memchr(piece + at, ':', searched - at);
+        if (!colon)
+            break;
+        at = static_cast<std::size_t>(static_cast<const char*>(colon) - piece) + 1;
+        ++colons;
+    }
+    if (colons >= m_colons) {
+        m_long_line.append(piece, at);
+        return true;
+    }
+    m_long_line.append(piece, nul ? searched + 1 : length);
+    return nul != nullptr;
+}
+
 std::optional<AccountLine> AccountLineReader::next()
 {
     if (m_fd < 0)
@@ -150,18 +200,15 @@ std::optional<AccountLine> AccountLineReader::next()
 
     // A line that goes on past the block: keep its head until the entry is decided (the
     // colons it depends on, or a NUL, are in), skip the rest up to the line end.
-    m_long_line.assign(start, m_end - m_begin);
-    auto colons = static_cast<std::size_t>(std::count(m_long_line.begin(), m_long_line.end(), ':'));
-    bool decided = colons >= m_colons || m_long_line.find('\0') != std::string::npos;
+    m_long_line.clear();
+    std::size_t colons = 0;
+    bool decided = keep_head(start, m_end - m_begin, colons);
     while (refill()) {
         const char* block = m_block.data();
         const void* newline = std::memchr(block, '\n', m_end);
         const std::size_t length = newline ? static_cast<std::size_t>(static_cast<const char*>(newline) - block) : m_end;
-        if (!decided) {
-            m_long_line.append(block, length);
-            colons += static_cast<std::size_t>(std::count(block, block + length, ':'));
-            decided = colons >= m_colons || std::memchr(block, '\0', length) != nullptr;
-        }
+        if (!decided)
+            decided = keep_head(block, length, colons);
         if (newline) {
             m_begin = length + 1;
             return AccountLine{m_long_line, true};

@@ -52,6 +52,9 @@ public:
 
 private:
     bool refill();
+    // Keeps the part of a piece of a long line that decides its entry, counting its
+    // colons; true once the entry is decided.
+    bool keep_head(const char* piece, std::size_t length, std::size_t& colons);
     int m_fd = -1;
     std::size_t m_colons;       // the colons up to the last field the entry depends on
     std::string m_block;
