@@ -17,12 +17,13 @@ int get_samba_info2(void);
 // Releases the lists the library filled: pss, pdfs and pnl.
 void Free_All_List(void);
 
-// DFS link records that get_dfs_info() fills.
+// DFS link records that get_dfs_info() fills. Each text (at most 511 characters) is
+// held by the record itself, after its fields.
 struct dfs_info {
-    char host[512];         // the remote host (second cell of the link grid)
-    char share[512];        // the remote share (third cell; the sharename look-up)
-    char link[512];         // the link's own name (first cell)
-    char group[512];        // the DFS group the link belongs to
+    char* host;             // the remote host (second cell of the link grid)
+    char* share;            // the remote share (third cell; the sharename look-up)
+    char* link;             // the link's own name (first cell)
+    char* group;            // the DFS group the link belongs to
     struct dfs_info* next;
 };
 extern struct dfs_info* pdfs;
