@@ -72,10 +72,12 @@ TEST(AccountNames, FindTheEntriesOfOddAndRandomLinesAsTheLibraryDoes)
     // Random files from a fixed seed: the same lines every run.
     std::mt19937 random(12);
     const std::string alphabet = std::string("ab:::::+-# \t\r\n\n0123456789x", 26) + std::string(1, '\0');
-    for (int round = 0; round < 1000; ++round) {
+    for (int round = 0; round < 2000; ++round) {
+        // Every other file without a NUL, whose well-formed lines take the short way.
+        const std::size_t letters = alphabet.size() - round % 2;
         std::string content(random() % 400, ' ');
         for (char& c : content)
-            c = alphabet[random() % alphabet.size()];
+            c = alphabet[random() % letters];
         expect_same_names(content, "random file " + std::to_string(round));
     }
 }
