@@ -52,7 +52,7 @@ fuzz:
 
 cross-build:
 	@scripts/setup-machine $(ARCH)
-	@cmake -S . -B $(CROSS_BUILD) -DCMAKE_TOOLCHAIN_FILE=cmake/toolchains/$(ARCH).cmake \
+	@cmake -S . -B $(CROSS_BUILD) -DCMAKE_TOOLCHAIN_FILE=cmake/toolchains/$(ARCH).cmake -DBUILD_TESTING=ON \
 	  -DCMAKE_BUILD_TYPE=RelWithDebInfo >/dev/null
 	@cmake --build $(CROSS_BUILD) -j$(JOBS)
 

@@ -46,5 +46,5 @@ done
 page=$(curl -sf "http://127.0.0.1:$port/")
 grep -q "<html" <<<"$page" || { echo "no console page: $page" >&2; exit 1; }
 answer=$(curl -sf "http://127.0.0.1:$port/cgi-bin/nas-accounts.cgi?cmd=cgi_get_service_info")
-grep -q "<service_info>" <<<"$answer" || { echo "no answer: $answer" >&2; cat "$scratch/error.log" >&2; exit 1; }
+grep -q "<cloud_access>0</cloud_access>" <<<"$answer" || { echo "no answer: $answer" >&2; cat "$scratch/error.log" >&2; exit 1; }
 echo "ok: the installed program answered on port $port"
