@@ -29,8 +29,7 @@ build: setup
 	@cmake -S . -B $(BUILD) -DCMAKE_BUILD_TYPE=RelWithDebInfo >/dev/null
 	@cmake --build $(BUILD) -j$(JOBS)
 
-# A test that fails is run once more; its first failure stays in the output.
-CTEST = ctest -j$(JOBS) --output-on-failure --repeat until-pass:2
+CTEST = ctest -j$(JOBS) --output-on-failure
 
 test: build
 	@cd $(BUILD) && $(CTEST)

@@ -1,0 +1,434 @@
+// The runner of the device cases in tests/device/cases/*.cases: each case is a test of
+// its own, on a fresh device. A case file is lines; "#" starts a comment line.
+//
+//   case NAME               a new case (NAME: letters, digits, _), on a fresh device
+//   let NAME TEXT           from here on, ${NAME} in the file's lines stands for TEXT;
+//                           "let NAME*N TEXT" for TEXT N times over
+//   block NAME ... end      lines that "@NAME ARG..." stands for, ${1} to ${9} its ARGs
+//
+// Setting the device up, before a request or between two:
+//   file PATH TEXT          a device file's content        rm PATH       removes one
+//   config KEY [VALUE]      a config-store key; without a value the key is removed
+//   volumes NAME            the volume table (one, two, four, usb, none) and its disks
+//   trace                   the developer trace on
+//   program PATH TEXT       an executable device file (a tool that prints TEXT, say)
+//
+// A request, then what it must do (everything not listed must not have happened):
+//   get CMD FIELD=VALUE...  a GET; "post" the same url-encoded; VALUE b64:TEXT is base64
+//   raw QUERY               a GET with its raw query string
+//   body TYPE BODY          a POST with a raw body of that type
+//   xml BODY                the answer: no-cache headers, text/xml, prologue, BODY;
+//                           "utf8 BODY" with charset=utf-8; "html" the empty page;
+//                           "answer BYTES" exactly; "answer any" not checked
+//   $ LINE                  a command line handed to the shell, and the tool event
+//                           the shell makes of it (words split, quotes removed)
+//   - NAME ARG...           one platform call or tool event of the journal; {A,B,...}
+//                           in a word makes one event per item, in that order
+//   journal any             the journal not checked; "without NAME..." drops events
+//                           (background tools) before comparing
+//   log TEXT                a system log line, without its "<PRI>"
+//   console TEXT            the developer trace's text
+//   is PATH TEXT            a device file's content afterwards ("is PATH" alone: gone)
+//   has PATH TEXT           ... contains TEXT;  lacks PATH TEXT   ... does not
+//   line FILE NAME TEXT     an account file's line for NAME ("(none)": no such line)
+//   key KEY VALUE           a config key afterwards ("(missing)": no such key)
+//
+// Words (fields, "-" events) are split at blanks; "..." groups a word and "" is an
+// empty one. TEXT, BODY and LINE run to the end of the line. Everywhere the escapes
+// \n \r \t \\ \" and \xHH stand for their bytes; other backslashes are themselves.
+#include <gtest/gtest.h>
+
+#include <filesystem>
+#include <fstream>
+#include <map>
+#include <sstream>
+
+#include "accounts_testing.h"
+
+namespace fs = std::filesystem;
+
+namespace {
+
+struct Line {
+    int number;
+    std::string text;
+};
+
+struct Case {
+    std::string file, name;
+    std::vector<Line> lines;
+};
+
+void PrintTo(const Case& c, std::ostream* out)
+{
+    *out << c.file << ".cases " << c.name;
+}
+
+std::string unescaped(std::string_view text)
+{
+    std::string out;
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        if (text[i] != '\\' || i + 1 == text.size()) {
+            out += text[i];
+            continue;
+        }
+        const char next = text[i + 1];
+        if (next == 'x' && i + 3 < text.size() + 0 && std::isxdigit(static_cast<unsigned char>(text[i + 2])) &&
+            std::isxdigit(static_cast<unsigned char>(text[i + 3]))) {
+            out += static_cast<char>(std::stoi(std::string(text.substr(i + 2, 2)), nullptr, 16));
+            i += 3;
+            continue;
+        }
+        const std::string_view plain = "nrt\\\"", bytes = "\n\r\t\\\"";
+        const auto at = plain.find(next);
+        out += at == std::string_view::npos ? std::string(1, '\\') : std::string(1, bytes[at]);
+        i += at == std::string_view::npos ? 0 : 1;
+    }
+    return out;
+}
+
+// Words at blanks; "..." groups (escapes inside and out).
+std::vector<std::string> words(std::string_view text)
+{
+    std::vector<std::string> found;
+    std::string raw;
+    bool in_word = false, quoted = false;
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        const char c = text[i];
+        if (c == '\\' && i + 1 < text.size()) {
+            raw += c;
+            raw += text[++i];
+            in_word = true;
+        } else if (c == '"') {
+            quoted = !quoted;
+            in_word = true;
+        } else if (c == ' ' && !quoted) {
+            if (in_word)
+                found.push_back(unescaped(raw));
+            raw.clear();
+            in_word = false;
+        } else {
+            raw += c;
+            in_word = true;
+        }
+    }
+    if (in_word)
+        found.push_back(unescaped(raw));
+    return found;
+}
+
+std::string replaced(std::string text, const std::map<std::string, std::string>& names)
+{
+    for (std::size_t at = text.find("${"); at != std::string::npos; at = text.find("${", at)) {
+        const std::size_t end = text.find('}', at);
+        const auto it = end == std::string::npos ? names.end() : names.find(text.substr(at + 2, end - at - 2));
+        if (it == names.end()) {
+            at += 2;
+            continue;
+        }
+        text.replace(at, end - at + 1, it->second);
+        at += it->second.size();
+    }
+    return text;
+}
+
+std::pair<std::string, std::string> split_first(const std::string& text)
+{
+    const auto blank = text.find(' ');
+    if (blank == std::string::npos)
+        return {text, ""};
+    return {text.substr(0, blank), text.substr(blank + 1)};
+}
+
+// "@NAME ARG..." as the block's lines, blocks inside it expanded too.
+void expand(const std::string& call, int number, const std::map<std::string, std::vector<std::string>>& blocks,
+            const std::map<std::string, std::string>& names, std::vector<Line>& lines)
+{
+    const auto [head, rest] = split_first(call);
+    std::map<std::string, std::string> args;
+    const auto values = words(rest);
+    for (std::size_t i = 0; i < values.size(); ++i)
+        args[std::to_string(i + 1)] = values[i];
+    for (const std::string& line : blocks.at(head.substr(1))) {
+        const std::string text = replaced(replaced(line, args), names);
+        if (text.starts_with("@"))
+            expand(text, number, blocks, names, lines);
+        else
+            lines.push_back({number, text});
+    }
+}
+
+std::vector<Case> load(const fs::path& path)
+{
+    std::ifstream in(path);
+    std::vector<Case> cases;
+    std::map<std::string, std::string> names;
+    std::map<std::string, std::vector<std::string>> blocks;
+    std::string text, open_block;
+    for (int number = 1; std::getline(in, text); ++number) {
+        if (text.empty() || text[0] == '#')
+            continue;
+        if (!open_block.empty()) {
+            if (text == "end")
+                open_block.clear();
+            else
+                blocks[open_block].push_back(text);
+            continue;
+        }
+        text = replaced(text, names);
+        const auto [head, rest] = split_first(text);
+        if (head == "let") {
+            const auto [name, value] = split_first(rest);
+            const auto star = name.find('*');
+            std::string repeated;
+            for (int n = star == std::string::npos ? 1 : std::stoi(name.substr(star + 1)); n > 0; --n)
+                repeated += value;
+            names[name.substr(0, star)] = repeated;
+        } else if (head == "block") {
+            open_block = rest;
+            blocks[rest].clear();
+        } else if (head == "case") {
+            cases.push_back({path.stem().string(), rest, {}});
+        } else if (cases.empty()) {
+            throw std::runtime_error(path.string() + ":" + std::to_string(number) + ": a line before the first case");
+        } else if (head[0] == '@') {
+            expand(text, number, blocks, names, cases.back().lines);
+        } else {
+            cases.back().lines.push_back({number, text});
+        }
+    }
+    return cases;
+}
+
+std::vector<Case> all_cases()
+{
+    std::vector<fs::path> files;
+    for (const auto& entry : fs::directory_iterator(std::string(NAS_SOURCE_DIR) + "/tests/device/cases")) {
+        if (entry.path().extension() == ".cases")
+            files.push_back(entry.path());
+    }
+    std::sort(files.begin(), files.end());
+    std::vector<Case> cases;
+    for (const fs::path& file : files) {
+        auto found = load(file);
+        cases.insert(cases.end(), found.begin(), found.end());
+    }
+    return cases;
+}
+
+Fields form_fields(const std::vector<std::string>& items)
+{
+    Fields fields;
+    for (const std::string& item : items) {
+        const auto eq = item.find('=');
+        std::string value = eq == std::string::npos ? "" : item.substr(eq + 1);
+        if (value.starts_with("b64:"))
+            value = base64(value.substr(4));
+        fields.emplace_back(item.substr(0, eq), value);
+    }
+    return fields;
+}
+
+std::string shown(const Journal& journal)
+{
+    std::string text;
+    for (const Event& event : journal) {
+        text += " ";
+        for (const std::string& word : event)
+            text += " [" + word + "]";
+        text += "\n";
+    }
+    return text;
+}
+
+// The events of a "-" line: one per item of its word's {A,B,...}, or just the one.
+void add_events(Journal& journal, const Event& event)
+{
+    for (std::size_t i = 0; i < event.size(); ++i) {
+        const std::size_t open = event[i].find('{'), close = event[i].find('}');
+        if (open == std::string::npos || close == std::string::npos || close < open)
+            continue;
+        std::istringstream items(event[i].substr(open + 1, close - open - 1));
+        for (std::string item; std::getline(items, item, ',');) {
+            Event one = event;
+            one[i] = event[i].substr(0, open) + item + event[i].substr(close + 1);
+            journal.push_back(one);
+        }
+        return;
+    }
+    journal.push_back(event);
+}
+
+// One request's expectations, checked when the next request, setup or the case's end comes.
+struct Pending {
+    int line = 0;
+    std::optional<std::string> answer;     // nullopt: not given
+    bool answer_any = false, journal_any = false;
+    std::string got, err;
+    int status = -1;
+    Journal journal;
+    std::vector<std::string> drop;
+    std::vector<std::string> log;
+    std::string console;
+};
+
+class CaseRun {
+public:
+    explicit CaseRun(const Case& c) : m_case(c) {}
+
+    void run()
+    {
+        for (const Line& line : m_case.lines) {
+            m_where = m_case.file + ".cases:" + std::to_string(line.number);
+            step(line.text);
+        }
+        settle();
+    }
+
+private:
+    void step(const std::string& text)
+    {
+        const auto [head, rest] = split_first(text);
+        const std::string arg = unescaped(rest);
+        if (head == "get" || head == "post" || head == "raw" || head == "body") {
+            settle();
+            m_pending.emplace();
+            m_pending->line = std::stoi(m_where.substr(m_where.rfind(':') + 1));
+            const auto items = words(rest);
+            m_dev.clear_records();
+            std::string query;
+            if (head == "get" || head == "post") {
+                query = "cmd=" + url_encode(items.at(0));
+                for (const auto& [name, value] : form_fields({items.begin() + 1, items.end()}))
+                    query += "&" + url_encode(name) + "=" + url_encode(value);
+            }
+            const Reply reply = head == "get"    ? m_dev.get_raw(query)
+                                : head == "post" ? m_dev.post_raw(query, "application/x-www-form-urlencoded")
+                                : head == "raw"  ? m_dev.get_raw(arg)
+                                                 : m_dev.post_raw(unescaped(split_first(rest).second), items.at(0));
+            m_pending->got = reply.out;
+            m_pending->status = reply.status;
+            m_pending->err = reply.err;
+        } else if (head == "file" || head == "rm" || head == "config" || head == "volumes" || head == "trace" ||
+                   head == "program") {
+            settle();
+            setup(head, rest);
+        } else if (!m_pending) {
+            ADD_FAILURE() << m_where << ": an expectation before any request: " << text;
+        } else {
+            expect(head, rest, arg);
+        }
+    }
+
+    void setup(const std::string& head, const std::string& rest)
+    {
+        const auto [first, second] = split_first(rest);
+        if (head == "file" || head == "program") {
+            m_dev.remove(first);
+            m_dev.write_file(first, unescaped(second));
+            if (head == "program")
+                fs::permissions(m_dev.host_path(first), fs::perms(0755));
+        } else if (head == "rm") {
+            m_dev.remove(rest);
+        } else if (head == "config") {
+            if (second.empty() && rest.find(' ') == std::string::npos)
+                m_dev.remove_config(first);
+            else
+                m_dev.config({{first, unescaped(second)}});
+        } else if (head == "trace") {
+            m_dev.trace_on();
+        } else {
+            static const std::map<std::string, std::string> tables = {
+                {"one", kOne}, {"two", kTwo}, {"four", kFour}, {"usb", kUsbBetween}, {"none", kNone}};
+            set_volume_table(m_dev, tables.count(rest) ? tables.at(rest) : unescaped(rest));
+        }
+    }
+
+    void expect(const std::string& head, const std::string& rest, const std::string& arg)
+    {
+        Pending& p = *m_pending;
+        const auto [first, second] = split_first(rest);
+        if (head == "xml")
+            p.answer = xml_answer(arg);
+        else if (head == "utf8")
+            p.answer = xml_utf8_answer(arg);
+        else if (head == "html")
+            p.answer = kEmptyHtml;
+        else if (head == "answer" && rest == "any")
+            p.answer_any = true;
+        else if (head == "answer")
+            p.answer = arg;
+        else if (head == "$")
+            p.journal = concat({p.journal, ran(arg)});
+        else if (head == "-")
+            add_events(p.journal, words(rest));
+        else if (head == "journal")
+            p.journal_any = true;
+        else if (head == "without")
+            p.drop = words(rest);
+        else if (head == "log")
+            p.log.push_back(arg);
+        else if (head == "console")
+            p.console += arg;
+        else if (head == "is" && second.empty() && rest.find(' ') == std::string::npos)
+            EXPECT_FALSE(m_dev.exists(first)) << m_where << ": " << first << " is still there";
+        else if (head == "is")
+            EXPECT_EQ(m_dev.read_file(first), unescaped(second)) << m_where;
+        else if (head == "has")
+            EXPECT_NE(m_dev.read_file(first).find(unescaped(second)), std::string::npos)
+                << m_where << ": " << first << " holds:\n" << m_dev.read_file(first);
+        else if (head == "lacks")
+            EXPECT_EQ(m_dev.read_file(first).find(unescaped(second)), std::string::npos)
+                << m_where << ": " << first << " holds:\n" << m_dev.read_file(first);
+        else if (head == "line") {
+            const auto [name, line] = split_first(second);
+            EXPECT_EQ(account_line(m_dev, first, name), unescaped(line)) << m_where;
+        } else if (head == "key")
+            EXPECT_EQ(m_dev.config_value(first), unescaped(second)) << m_where;
+        else
+            ADD_FAILURE() << m_where << ": what is \"" << head << "\"?";
+    }
+
+    // Checks the last request's answer and records against what its lines expect.
+    void settle()
+    {
+        if (!m_pending)
+            return;
+        const Pending& p = *m_pending;
+        const std::string where = m_case.file + ".cases:" + std::to_string(p.line);
+        EXPECT_EQ(p.status, 0) << where << ": the program ended badly:\n" << p.err;
+        if (p.answer)
+            EXPECT_EQ(p.got, *p.answer) << where;
+        else if (!p.answer_any)
+            ADD_FAILURE() << where << ": the request has no expected answer; it answered:\n" << p.got;
+        if (!p.journal_any) {
+            const Journal got = m_dev.journal();
+            Journal kept;
+            for (const Event& event : got) {
+                if (std::find(p.drop.begin(), p.drop.end(), event.at(0)) == p.drop.end())
+                    kept.push_back(event);
+            }
+            EXPECT_EQ(kept, p.journal) << where << ": the journal was\n" << shown(kept) << "expected\n" << shown(p.journal);
+        }
+        EXPECT_EQ(logged(m_dev), p.log) << where;
+        EXPECT_EQ(m_dev.console(), p.console) << where;
+        m_pending.reset();
+    }
+
+    const Case& m_case;
+    Device m_dev;
+    std::optional<Pending> m_pending;
+    std::string m_where;
+};
+
+class DeviceCase : public testing::TestWithParam<Case> {};
+
+} // namespace
+
+TEST_P(DeviceCase, Runs)
+{
+    CaseRun(GetParam()).run();
+}
+
+INSTANTIATE_TEST_SUITE_P(Cases, DeviceCase, testing::ValuesIn(all_cases()),
+                         [](const testing::TestParamInfo<Case>& info) { return info.param.file + "_" + info.param.name; });
