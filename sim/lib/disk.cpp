@@ -4,30 +4,71 @@
 // on the machine the simulation runs on.
 #include "platform/quota.h"
 
-#include <cstdio>
-#include <cstring>
-#include <fstream>
-#include <sstream>
+#include <cerrno>
+#include <cstdlib>
+#include <optional>
 #include <string>
+#include <string_view>
 
 #include "journal.h"
+#include "text_file.h"
+
+namespace {
+
+bool is_blank(char c)
+{
+    return c == ' ' || (c >= '\t' && c <= '\r');
+}
+
+// The next blank-separated word of the line, or nothing at its end.
+std::optional<std::string_view> next_word(std::string_view& rest)
+{
+    std::size_t begin = 0;
+    while (begin < rest.size() && is_blank(rest[begin]))
+        ++begin;
+    if (begin == rest.size())
+        return std::nullopt;
+    std::size_t end = begin;
+    while (end < rest.size() && !is_blank(rest[end]))
+        ++end;
+    const std::string_view word = rest.substr(begin, end - begin);
+    rest.remove_prefix(end);
+    return word;
+}
+
+// A number in base 10 at the start of the rest (after blanks), as a stream reads it.
+std::optional<unsigned long long> next_number(std::string_view& rest)
+{
+    const std::string text(rest);
+    char* end = nullptr;
+    errno = 0;
+    const unsigned long long value = std::strtoull(text.c_str(), &end, 10);
+    if (end == text.c_str() || errno == ERANGE)
+        return std::nullopt;
+    rest.remove_prefix(static_cast<std::size_t>(end - text.c_str()));
+    return value;
+}
+
+} // namespace
 
 extern "C" int LIB_Get_Disk_Size(const char* mount_path, unsigned long long* total,
                                  unsigned long long* used, unsigned long long* free_space)
 {
     journal_record("LIB_Get_Disk_Size", {mount_path});
-    std::ifstream disks("/sim/disks");
-    std::string line;
-    while (std::getline(disks, line)) {
-        std::istringstream fields(line);
-        std::string path;
-        unsigned long long t = 0, u = 0, f = 0;
-        if (!(fields >> path >> t >> u >> f) || path != mount_path)
-            continue;
-        *total = t;
-        *used = u;
-        *free_space = f;
-        return 0;
-    }
-    return -1;
+    int result = -1;
+    for_each_line(read_text("/sim/disks"), [&](std::string_view rest) {
+        if (result == 0)
+            return;
+        const auto path = next_word(rest);
+        const auto t = next_number(rest);
+        const auto u = t ? next_number(rest) : std::nullopt;
+        const auto f = u ? next_number(rest) : std::nullopt;
+        if (!f || *path != mount_path)
+            return;
+        *total = *t;
+        *used = *u;
+        *free_space = *f;
+        result = 0;
+    });
+    return result;
 }

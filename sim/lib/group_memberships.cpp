@@ -3,6 +3,7 @@
 #include <cerrno>
 #include <cstring>
 #include <fcntl.h>
+#include <memory>
 #include <optional>
 #include <sys/stat.h>
 #include <unistd.h>
@@ -79,24 +80,26 @@ void add_line(std::string& line, std::vector<Membership>& rows)
 std::vector<Membership> read_memberships(int fd)
 {
     std::vector<Membership> rows;
-    std::string block(64 * 1024, '\0');
+    // Small and never cleared: each of its pages is a page fault of the request.
+    constexpr std::size_t kBlockSize = 16 * 1024;
+    const auto block = std::make_unique_for_overwrite<char[]>(kBlockSize);
     std::string line;
     const std::string_view skipped_start = "allaccount:";
     bool skipping = false;
     for (;;) {
         ssize_t got = 0;
         do
-            got = read(fd, block.data(), block.size());
+            got = read(fd, block.get(), kBlockSize);
         while (got < 0 && errno == EINTR);
         if (got <= 0)
             break;
         std::size_t at = 0;
         const auto end = static_cast<std::size_t>(got);
         while (at < end) {
-            const void* newline = std::memchr(block.data() + at, '\n', end - at);
-            const std::size_t stop = newline ? static_cast<std::size_t>(static_cast<const char*>(newline) - block.data()) : end;
+            const void* newline = std::memchr(block.get() + at, '\n', end - at);
+            const std::size_t stop = newline ? static_cast<std::size_t>(static_cast<const char*>(newline) - block.get()) : end;
             if (!skipping) {
-                line.append(block, at, stop - at);
+                line.append(block.get() + at, stop - at);
                 if (line.size() >= skipped_start.size() && line.compare(0, skipped_start.size(), skipped_start) == 0) {
                     skipping = true;
                     line.clear();

@@ -31,6 +31,8 @@ struct name_list* pnl = nullptr;
 namespace {
 
 constexpr int kDone = 0;
+// The library's text fields hold at most this many bytes, the terminator included.
+constexpr std::size_t kDfsTextSize = 512;
 constexpr int kRefused = -1;
 
 bool storable(std::string_view text)
@@ -145,13 +147,24 @@ extern "C" int get_dfs_info(void)
     int count = 0;
     dfs_info** tail = &pdfs;
     for (const DfsLink& link : load_dfs_links()) {
-        auto* record = static_cast<dfs_info*>(std::calloc(1, sizeof(dfs_info)));
+        // The record and its four texts are one allocation, the texts after the record:
+        // a list of 400 links is a few pages, not 400 records of the texts' largest size.
+        const auto kept = [](const std::string& text) { return std::min(text.size(), kDfsTextSize - 1); };
+        const std::size_t size = sizeof(dfs_info) + kept(link.host) + kept(link.path) + kept(link.link) + kept(link.group) + 4;
+        auto* record = static_cast<dfs_info*>(std::calloc(1, size));
         if (!record)
             break;
-        copy_field(record->host, sizeof record->host, link.host);
-        copy_field(record->share, sizeof record->share, link.path);
-        copy_field(record->link, sizeof record->link, link.link);
-        copy_field(record->group, sizeof record->group, link.group);
+        char* place = reinterpret_cast<char*>(record + 1);
+        const auto hold = [&](const std::string& text) {
+            char* field = place;
+            copy_field(field, kDfsTextSize, text);
+            place += kept(text) + 1;
+            return field;
+        };
+        record->host = hold(link.host);
+        record->share = hold(link.path);
+        record->link = hold(link.link);
+        record->group = hold(link.group);
         *tail = record;
         tail = &record->next;
         ++count;

@@ -6,6 +6,7 @@
 // allocated with calloc and released here with free, one record at a time.
 #include "platform/samba.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <cstring>
 
@@ -15,6 +16,9 @@
 struct share_info* pss = nullptr;
 
 namespace {
+
+// The longest share path a record holds, as a path buffer of the system's size would.
+constexpr std::size_t kLongestSharePath = 4095;
 
 template <typename Record>
 void free_list(Record*& head)
@@ -26,28 +30,39 @@ void free_list(Record*& head)
     }
 }
 
-void copy_field(char* field, std::size_t size, const std::string& text)
+// The text up to its first NUL, of at most `longest` characters.
+std::string_view c_text(std::string_view text, std::size_t longest)
 {
-    std::strncpy(field, text.c_str(), size - 1);
+    return text.substr(0, std::min(text.find('\0'), longest));
 }
 
 } // namespace
 
+// A record and its path are one allocation, the path right after the record: the list
+// of 200 shares is a few pages, not 200 records of a path's largest size.
 extern "C" int get_samba_info2(void)
 {
     journal_record("get_samba_info2", {});
     free_list(pss);
     share_info** tail = &pss;
-    for (const ShareEntry& share : load_shares()) {
-        auto* record = static_cast<share_info*>(std::calloc(1, sizeof(share_info)));
-        if (record == nullptr)
-            return -1;
-        copy_field(record->name, sizeof record->name, share.name);
-        copy_field(record->path, sizeof record->path, share.path);
+    int result = 0;
+    for_each_share_location([&](std::string_view name, std::string_view path) {
+        if (result != 0)
+            return;
+        const std::string_view kept_name = c_text(name, sizeof(share_info::name) - 1);
+        const std::string_view kept_path = c_text(path, kLongestSharePath);
+        auto* record = static_cast<share_info*>(std::calloc(1, sizeof(share_info) + kept_path.size() + 1));
+        if (record == nullptr) {
+            result = -1;
+            return;
+        }
+        std::memcpy(record->name, kept_name.data(), kept_name.size());
+        record->path = reinterpret_cast<char*>(record + 1);
+        std::memcpy(record->path, kept_path.data(), kept_path.size());
         *tail = record;
         tail = &record->next;
-    }
-    return 0;
+    });
+    return result;
 }
 
 extern "C" void Free_All_List(void)

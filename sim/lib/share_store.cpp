@@ -1,5 +1,6 @@
 #include "share_store.h"
 
+#include <algorithm>
 #include <cstdlib>
 #include <filesystem>
 
@@ -76,6 +77,19 @@ std::vector<ShareEntry> load_shares()
                           std::atoi(f[6].c_str()), std::atoi(f[7].c_str()), parse_access(f[8])});
     }
     return shares;
+}
+
+void for_each_share_location(const std::function<void(std::string_view name, std::string_view path)>& visit)
+{
+    for_each_line(read_text(kShareStorePath), [&](std::string_view line) {
+        // Nine fields, the name not empty: the lines load_shares() takes.
+        if (std::count(line.begin(), line.end(), '\t') != 8)
+            return;
+        const auto name_end = line.find('\t');
+        const auto path_end = line.find('\t', name_end + 1);
+        if (name_end > 0)
+            visit(line.substr(0, name_end), line.substr(name_end + 1, path_end - name_end - 1));
+    });
 }
 
 bool save_shares(const std::vector<ShareEntry>& shares)

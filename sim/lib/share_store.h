@@ -7,6 +7,7 @@
 // /shares/NAME, which resolves to its folder. A missing store reads as empty.
 #pragma once
 
+#include <functional>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -37,6 +38,9 @@ bool is_storable_account(std::string_view account);
 bool is_storable_share_path(std::string_view path);
 
 std::vector<ShareEntry> load_shares();
+// The name and path of every share load_shares() gives, in store order, without
+// building whole entries: the share list of every session page reads them.
+void for_each_share_location(const std::function<void(std::string_view name, std::string_view path)>& visit);
 bool save_shares(const std::vector<ShareEntry>& shares);
 
 // Creates the share's folder (and its parents) and points /shares/NAME at it; an entry

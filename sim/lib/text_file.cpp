@@ -1,19 +1,31 @@
 #include "text_file.h"
 
-#include <fstream>
-
 #include "cgi/atomic_file.h"
+
+std::string read_text(const std::string& path)
+{
+    std::string text;
+    if (!read_whole_file(path, text))
+        text.clear();
+    return text;
+}
+
+void for_each_line(std::string_view text, const std::function<void(std::string_view line)>& visit)
+{
+    while (!text.empty()) {
+        const auto newline = text.find('\n');
+        std::string_view line = text.substr(0, newline);
+        text = newline == std::string_view::npos ? std::string_view() : text.substr(newline + 1);
+        if (!line.empty() && line.back() == '\r')
+            line.remove_suffix(1);
+        visit(line);
+    }
+}
 
 std::vector<std::string> read_lines(const std::string& path)
 {
     std::vector<std::string> lines;
-    std::ifstream in(path);
-    std::string line;
-    while (std::getline(in, line)) {
-        if (!line.empty() && line.back() == '\r')
-            line.pop_back();
-        lines.push_back(line);
-    }
+    for_each_line(read_text(path), [&](std::string_view line) { lines.emplace_back(line); });
     return lines;
 }
 

@@ -1,11 +1,17 @@
 // Whole-file reading and writing for the simulated platform's stores.
 #pragma once
 
+#include <functional>
 #include <string>
 #include <string_view>
 #include <utility>
 #include <vector>
 
+// The whole file; empty when the file is missing or cannot be read.
+std::string read_text(const std::string& path);
+// Each line of the text without its line end (LF, and a CR before it), as read_lines
+// gives them.
+void for_each_line(std::string_view text, const std::function<void(std::string_view line)>& visit);
 // The file's lines without their line ends; empty when the file is missing.
 std::vector<std::string> read_lines(const std::string& path);
 // Replaces the file with these lines, each ending in LF, atomically (replace_file in

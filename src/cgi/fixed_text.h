@@ -7,7 +7,9 @@
 #include <cstdarg>
 #include <cstddef>
 #include <cstdio>
+#include <cstdlib>
 #include <cstring>
+#include <memory>
 #include <string_view>
 
 template <std::size_t N>
@@ -54,4 +56,28 @@ public:
 
 private:
     std::array<char, N> m_bytes;
+};
+
+// A zero-filled buffer of N bytes that a library fills with a C string, kept on the
+// heap: calloc hands out fresh memory without writing to it, so of a large buffer
+// only the pages the library writes are ever touched.
+template <std::size_t N>
+class ZeroedBuffer {
+public:
+    ZeroedBuffer() : m_bytes(static_cast<char*>(std::calloc(N, 1))) {}
+    explicit operator bool() const { return m_bytes != nullptr; }
+
+    char* data() { return m_bytes.get(); }
+    const char* c_str() const { return m_bytes.get(); }
+    static constexpr int size() { return static_cast<int>(N); }
+
+    // Zero-filled again after a C string was written into it (at most N-1 characters
+    // and their terminator): only what the string covers is cleared.
+    void clear_string() { std::memset(m_bytes.get(), 0, strnlen(m_bytes.get(), N)); }
+
+private:
+    struct Free {
+        void operator()(char* bytes) const { std::free(bytes); }
+    };
+    std::unique_ptr<char, Free> m_bytes;
 };

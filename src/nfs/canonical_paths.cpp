@@ -1,11 +1,12 @@
 #include "nfs/canonical_paths.h"
 
+#include <algorithm>
 #include <array>
 #include <cerrno>
 #include <climits>
 #include <cstdlib>
+#include <string_view>
 #include <unistd.h>
-#include <unordered_set>
 #include <vector>
 
 namespace {
@@ -23,49 +24,54 @@ std::optional<std::string> system_canonical(const std::string& path)
     return std::string(resolved.data());
 }
 
-// The components of a text, or nothing when the text holds one that realpath() treats
-// in its own way ("." and "..", a trailing "/"): such a text is left to realpath().
-std::optional<std::vector<std::string>> plain_components(const std::string& text)
+// Whether realpath() itself must treat a text: an empty one, one too long, one ending
+// in "/", or one holding a "." or ".." component.
+bool is_plain(std::string_view text)
 {
     if (text.empty() || text.back() == '/' || text.size() >= kLongestPath)
-        return std::nullopt;
-    std::vector<std::string> components;
+        return false;
     std::size_t begin = 0;
     while (begin < text.size()) {
         const auto end = std::min(text.find('/', begin), text.size());
-        if (end > begin) {
-            std::string component = text.substr(begin, end - begin);
-            if (component == "." || component == "..")
-                return std::nullopt;
-            components.push_back(std::move(component));
-        }
+        const std::string_view component = text.substr(begin, end - begin);
+        if (component == "." || component == "..")
+            return false;
         begin = end + 1;
     }
-    return components;
+    return true;
 }
 
-std::string joined(const std::string& dir, const std::string& name)
+std::string joined(std::string_view dir, std::string_view name)
 {
-    return dir == "/" ? "/" + name : dir + "/" + name;
+    std::string path;
+    path.reserve(dir.size() + 1 + name.size());
+    path += dir;
+    if (dir != "/")
+        path += '/';
+    path += name;
+    return path;
 }
 
-using StepOutcome = CanonicalStep;
+const CanonicalStep kUndecided{std::nullopt, 0, true};
+const CanonicalStep kLoop{std::nullopt, kMostLinks + 1, false};
 
 struct Stepper {
-    std::unordered_map<std::string, StepOutcome>& steps;
-    std::unordered_set<std::string> in_progress;
+    std::unordered_map<std::string, CanonicalStep>& steps;
+    std::vector<std::string> following;     // the links being followed, innermost last
 
-    StepOutcome step(const std::string& dir, const std::string& name)
+    // The step into `name` inside the canonical directory `dir`, remembered unless it
+    // depends on the links being followed.
+    const CanonicalStep& step(const std::string& dir, std::string_view name)
     {
-        const std::string path = joined(dir, name);
+        std::string path = joined(dir, name);
         if (const auto known = steps.find(path); known != steps.end())
             return known->second;
         if (path.size() >= kLongestPath)
-            return {std::nullopt, 0, true};
-        if (in_progress.count(path))
-            return {std::nullopt, kMostLinks + 1, false};      // a loop of links
+            return kUndecided;
+        if (std::find(following.begin(), following.end(), path) != following.end())
+            return kLoop;
 
-        StepOutcome outcome;
+        CanonicalStep outcome;
         std::array<char, PATH_MAX> target{};
         const ssize_t length = readlink(path.c_str(), target.data(), target.size() - 1);
         if (length < 0) {
@@ -75,27 +81,30 @@ struct Stepper {
         } else if (length == 0 || static_cast<std::size_t>(length) >= target.size() - 2) {
             outcome.undecided = true;
         } else {
-            in_progress.insert(path);
-            const std::string text(target.data(), static_cast<std::size_t>(length));
-            const StepOutcome followed = walk(text[0] == '/' ? "/" : dir, text);
-            in_progress.erase(path);
-            outcome = followed;
-            outcome.links = followed.links + 1;
+            following.push_back(path);
+            const std::string_view text(target.data(), static_cast<std::size_t>(length));
+            outcome = walk(text[0] == '/' ? "/" : dir, text);
+            following.pop_back();
+            outcome.links += 1;
             if (outcome.links > kMostLinks)
                 outcome.path.reset();
         }
-        steps.emplace(path, outcome);
-        return outcome;
+        return steps.emplace(std::move(path), std::move(outcome)).first->second;
     }
 
-    StepOutcome walk(const std::string& start, const std::string& text)
+    CanonicalStep walk(std::string_view start, std::string_view text)
     {
-        const auto components = plain_components(text);
-        if (!components)
-            return {std::nullopt, 0, true};
-        StepOutcome outcome{start, 0, false};
-        for (const std::string& name : *components) {
-            const StepOutcome next = step(*outcome.path, name);
+        if (!is_plain(text))
+            return kUndecided;
+        CanonicalStep outcome{std::string(start), 0, false};
+        std::size_t begin = 0;
+        while (begin < text.size()) {
+            const auto end = std::min(text.find('/', begin), text.size());
+            const std::string_view name = text.substr(begin, end - begin);
+            begin = end + 1;
+            if (name.empty())
+                continue;
+            const CanonicalStep& next = step(*outcome.path, name);
             if (next.undecided)
                 return next;
             outcome.links += next.links;
@@ -116,7 +125,7 @@ const std::optional<std::string>& CanonicalPaths::of(const std::string& path)
         return place->second;
     if (!path.empty() && path[0] == '/') {
         Stepper stepper{m_steps, {}};
-        const StepOutcome outcome = stepper.walk("/", path);
+        const CanonicalStep outcome = stepper.walk("/", path);
         if (!outcome.undecided) {
             place->second = outcome.path;
             return place->second;

@@ -2,6 +2,7 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstring>
+#include <new>
 #include <string>
 #include <string_view>
 #include <strings.h>
@@ -82,14 +83,19 @@ void list_domain_users(const FixedText<4>& page, FilteredPageCounter& counter, c
 
 void list_local_users(const FixedText<4>& page, FilteredPageCounter& counter, const UserFilter& filter)
 {
+    // One zeroed buffer serves every row: the library writes a C string into it, and
+    // what it wrote is cleared again after the row.
+    ZeroedBuffer<55296> groups;
     for_each_account_name("/etc/passwd", AccountFile::Passwd, [&](std::string_view entry) {
         if (is_reserved_user(entry))
             return;
         if (const int id = counter.offer(filter.passes(entry))) {
             const std::string name(entry);
-            FixedText<55296> groups;
+            if (!groups)
+                throw std::bad_alloc();
             LIB_Web_Get_User_Join_Group(name.c_str(), groups.data());
             write_grid_row(id, {name.c_str(), groups.c_str()});
+            groups.clear_string();
         }
     });
     write_grid_end(page.c_str(), counter.total());

@@ -15,6 +15,7 @@
 #pragma once
 
 #include <cstddef>
+#include <memory>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -46,15 +47,23 @@ public:
     explicit operator bool() const { return m_fd >= 0; }
     // The next line, or its head; nothing at the end of the file.
     std::optional<AccountLine> next();
+    // The name of the next entry, or nothing at the end of the file. The name may
+    // point into `scratch`.
+    std::optional<std::string_view> next_name(std::string& scratch);
     ~AccountLineReader();
     AccountLineReader(const AccountLineReader&) = delete;
     AccountLineReader& operator=(const AccountLineReader&) = delete;
 
 private:
     bool refill();
+    // Keeps the part of a piece of a long line that decides its entry, counting its
+    // colons; true once the entry is decided.
+    bool keep_head(const char* piece, std::size_t length, std::size_t& colons);
+    std::optional<std::string_view> plain_entry_name();
     int m_fd = -1;
+    AccountFile m_kind;
     std::size_t m_colons;       // the colons up to the last field the entry depends on
-    std::string m_block;
+    std::unique_ptr<char[]> m_block;    // kBlockSize bytes, never cleared: read() fills them
     std::size_t m_begin = 0;
     std::size_t m_end = 0;
     bool m_block_holds_nul = false;
@@ -70,9 +79,7 @@ bool for_each_account_name(const char* path, AccountFile kind, Visit visit)
     if (!reader)
         return false;
     std::string scratch;
-    while (const auto line = reader.next()) {
-        if (const auto name = account_entry_name(*line, kind, scratch))
-            visit(*name);
-    }
+    while (const auto name = reader.next_name(scratch))
+        visit(*name);
     return true;
 }

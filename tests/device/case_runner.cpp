@@ -8,6 +8,7 @@
 //
 // Setting the device up, before a request or between two:
 //   file PATH TEXT          a device file's content        rm PATH       removes one
+//   append PATH TEXT        TEXT added at a device file's end
 //   config KEY [VALUE]      a config-store key; without a value the key is removed
 //   volumes NAME            the volume table (one, two, four, usb, none) and its disks
 //   trace                   the developer trace on
@@ -26,10 +27,11 @@
 //                           in a word makes one event per item, in that order
 //   journal any             the journal not checked; "without NAME..." drops events
 //                           (background tools) before comparing
-//   log TEXT                a system log line, without its "<PRI>"
+//   log TEXT                a system log line ("<14>SYSTEM: ...")
 //   console TEXT            the developer trace's text
 //   is PATH TEXT            a device file's content afterwards ("is PATH" alone: gone)
 //   has PATH TEXT           ... contains TEXT;  lacks PATH TEXT   ... does not
+//   same PATH               a device file as it was before the request
 //   line FILE NAME TEXT     an account file's line for NAME ("(none)": no such line)
 //   key KEY VALUE           a config key afterwards ("(missing)": no such key)
 //
@@ -278,19 +280,46 @@ public:
 
     void run()
     {
-        for (const Line& line : m_case.lines) {
-            m_where = m_case.file + ".cases:" + std::to_string(line.number);
-            step(line.text);
+        for (std::size_t i = 0; i < m_case.lines.size(); ++i) {
+            m_where = m_case.file + ".cases:" + std::to_string(m_case.lines[i].number);
+            if (is_request(m_case.lines[i].text))
+                keep_before(i);
+            step(m_case.lines[i].text);
         }
         settle();
     }
 
 private:
+    static bool is_request(const std::string& text)
+    {
+        const std::string head = split_first(text).first;
+        return head == "get" || head == "post" || head == "raw" || head == "body";
+    }
+    static bool is_setup(const std::string& text)
+    {
+        const std::string head = split_first(text).first;
+        return head == "file" || head == "append" || head == "rm" || head == "config" || head == "volumes" ||
+               head == "trace" || head == "program";
+    }
+
+    // The files that the request at `at` must leave as they are, read before it runs.
+    void keep_before(std::size_t at)
+    {
+        m_before.clear();
+        for (std::size_t i = at + 1; i < m_case.lines.size(); ++i) {
+            const std::string& text = m_case.lines[i].text;
+            if (is_request(text) || is_setup(text))
+                break;
+            if (split_first(text).first == "same")
+                m_before[split_first(text).second] = m_dev.read_file(split_first(text).second);
+        }
+    }
+
     void step(const std::string& text)
     {
         const auto [head, rest] = split_first(text);
         const std::string arg = unescaped(rest);
-        if (head == "get" || head == "post" || head == "raw" || head == "body") {
+        if (is_request(text)) {
             settle();
             m_pending.emplace();
             m_pending->line = std::stoi(m_where.substr(m_where.rfind(':') + 1));
@@ -309,8 +338,7 @@ private:
             m_pending->got = reply.out;
             m_pending->status = reply.status;
             m_pending->err = reply.err;
-        } else if (head == "file" || head == "rm" || head == "config" || head == "volumes" || head == "trace" ||
-                   head == "program") {
+        } else if (is_setup(text)) {
             settle();
             setup(head, rest);
         } else if (!m_pending) {
@@ -323,7 +351,9 @@ private:
     void setup(const std::string& head, const std::string& rest)
     {
         const auto [first, second] = split_first(rest);
-        if (head == "file" || head == "program") {
+        if (head == "append") {
+            m_dev.write_file(first, m_dev.read_file(first) + unescaped(second));
+        } else if (head == "file" || head == "program") {
             m_dev.remove(first);
             m_dev.write_file(first, unescaped(second));
             if (head == "program")
@@ -383,7 +413,9 @@ private:
         else if (head == "line") {
             const auto [name, line] = split_first(second);
             EXPECT_EQ(account_line(m_dev, first, name), unescaped(line)) << m_where;
-        } else if (head == "key")
+        } else if (head == "same")
+            EXPECT_EQ(m_dev.read_file(rest), m_before[rest]) << m_where << ": " << rest << " changed";
+        else if (head == "key")
             EXPECT_EQ(m_dev.config_value(first), unescaped(second)) << m_where;
         else
             ADD_FAILURE() << m_where << ": what is \"" << head << "\"?";
@@ -410,7 +442,7 @@ private:
             }
             EXPECT_EQ(kept, p.journal) << where << ": the journal was\n" << shown(kept) << "expected\n" << shown(p.journal);
         }
-        EXPECT_EQ(logged(m_dev), p.log) << where;
+        EXPECT_EQ(m_dev.messages(), p.log) << where;
         EXPECT_EQ(m_dev.console(), p.console) << where;
         m_pending.reset();
     }
@@ -418,6 +450,7 @@ private:
     const Case& m_case;
     Device m_dev;
     std::optional<Pending> m_pending;
+    std::map<std::string, std::string> m_before;
     std::string m_where;
 };
 
