@@ -13,11 +13,14 @@
 //   volumes NAME            the volume table (one, two, four, usb, none) and its disks
 //   trace                   the developer trace on
 //   program PATH TEXT       an executable device file (a tool that prints TEXT, say)
+//   link PATH TARGET        a symbolic link
 //
 // A request, then what it must do (everything not listed must not have happened):
 //   get CMD FIELD=VALUE...  a GET; "post" the same url-encoded; VALUE b64:TEXT is base64
 //   raw QUERY               a GET with its raw query string
 //   body TYPE BODY          a POST with a raw body of that type
+//   run ARG...              a command inside the device, its output the answer; a
+//                           first word without "/" is a probe of the build
 //   xml BODY                the answer: no-cache headers, text/xml, prologue, BODY;
 //                           "utf8 BODY" with charset=utf-8; "html" the empty page;
 //                           "answer BYTES" exactly; "answer any" not checked
@@ -293,13 +296,13 @@ private:
     static bool is_request(const std::string& text)
     {
         const std::string head = split_first(text).first;
-        return head == "get" || head == "post" || head == "raw" || head == "body";
+        return head == "get" || head == "post" || head == "raw" || head == "body" || head == "run";
     }
     static bool is_setup(const std::string& text)
     {
         const std::string head = split_first(text).first;
         return head == "file" || head == "append" || head == "rm" || head == "config" || head == "volumes" ||
-               head == "trace" || head == "program";
+               head == "trace" || head == "program" || head == "link";
     }
 
     // The files that the request at `at` must leave as they are, read before it runs.
@@ -331,7 +334,13 @@ private:
                 for (const auto& [name, value] : form_fields({items.begin() + 1, items.end()}))
                     query += "&" + url_encode(name) + "=" + url_encode(value);
             }
-            const Reply reply = head == "get"    ? m_dev.get_raw(query)
+            std::vector<std::string> argv = items;
+            if (head == "run" && argv.at(0).find('/') == std::string::npos) {
+                m_dev.install_probe(argv[0]);
+                argv[0] = "/sbin/" + argv[0];
+            }
+            const Reply reply = head == "run"    ? m_dev.run(argv)
+                                : head == "get"  ? m_dev.get_raw(query)
                                 : head == "post" ? m_dev.post_raw(query, "application/x-www-form-urlencoded")
                                 : head == "raw"  ? m_dev.get_raw(arg)
                                                  : m_dev.post_raw(unescaped(split_first(rest).second), items.at(0));
@@ -365,6 +374,8 @@ private:
                 m_dev.remove_config(first);
             else
                 m_dev.config({{first, unescaped(second)}});
+        } else if (head == "link") {
+            m_dev.symlink(second, first);
         } else if (head == "trace") {
             m_dev.trace_on();
         } else {
