@@ -328,12 +328,8 @@ private:
             m_pending->line = std::stoi(m_where.substr(m_where.rfind(':') + 1));
             const auto items = words(rest);
             m_dev.clear_records();
-            std::string query;
-            if (head == "get" || head == "post") {
-                query = "cmd=" + url_encode(items.at(0));
-                for (const auto& [name, value] : form_fields({items.begin() + 1, items.end()}))
-                    query += "&" + url_encode(name) + "=" + url_encode(value);
-            }
+            const std::string query =
+                head == "get" || head == "post" ? query_string(items.at(0), form_fields({items.begin() + 1, items.end()})) : "";
             std::vector<std::string> argv = items;
             if (head == "run" && argv.at(0).find('/') == std::string::npos) {
                 m_dev.install_probe(argv[0]);
@@ -379,9 +375,17 @@ private:
         } else if (head == "trace") {
             m_dev.trace_on();
         } else {
+            // Disks of 1877538, 937795, 4096 and 2048 megabytes for HD_a2 to HD_d2.
             static const std::map<std::string, std::string> tables = {
-                {"one", kOne}, {"two", kTwo}, {"four", kFour}, {"usb", kUsbBetween}, {"none", kNone}};
-            set_volume_table(m_dev, tables.count(rest) ? tables.at(rest) : unescaped(rest));
+                {"one", "Volume_1 = HD_a2\n"},
+                {"two", "Volume_1 = HD_a2\nVolume_2 = HD_b2\n"},
+                {"four", "Volume_1 = HD_a2\nVolume_2 = HD_b2\nVolume_3 = HD_c2\nVolume_4 = HD_d2\n"},
+                {"usb", "Volume_1 = HD_a2\nUSB_1 = sdc1\nVolume_2 = HD_b2\n"}};
+            m_dev.remove("/etc/shared_name");
+            if (rest != "none")
+                m_dev.write_file("/etc/shared_name", tables.count(rest) ? tables.at(rest) : unescaped(rest));
+            m_dev.write_file("/sim/disks", "/mnt/HD/HD_a2 1922599448 48211960 1874387488\n/mnt/HD/HD_b2 960302096 "
+                                           "1048576 959253520\n/mnt/HD/HD_c2 4194304 0 4194304\n/mnt/HD/HD_d2 2097152 0 2097152\n");
         }
     }
 
@@ -400,7 +404,8 @@ private:
         else if (head == "answer")
             p.answer = arg;
         else if (head == "$")
-            p.journal = concat({p.journal, ran(arg)});
+            for (const Event& event : ran(arg))
+                p.journal.push_back(event);
         else if (head == "-")
             add_events(p.journal, words(rest));
         else if (head == "journal")
