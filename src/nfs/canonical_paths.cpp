@@ -5,6 +5,9 @@
 #include <cerrno>
 #include <climits>
 #include <cstdlib>
+#include <dirent.h>
+#include <fcntl.h>
+#include <memory>
 #include <string_view>
 #include <unistd.h>
 #include <vector>
@@ -52,11 +55,47 @@ std::string joined(std::string_view dir, std::string_view name)
     return path;
 }
 
+struct DirectoryCloser {
+    void operator()(DIR* directory) const { closedir(directory); }
+};
+
+// Reads the directory's entries, when it can be searched (else a look-up inside it
+// fails in its own way, which only readlink() tells).
+void read_listing(const std::string& dir, DirectoryListing& listing)
+{
+    if (faccessat(AT_FDCWD, dir.c_str(), X_OK, AT_EACCESS) != 0)
+        return;
+    const std::unique_ptr<DIR, DirectoryCloser> directory(opendir(dir.c_str()));
+    if (!directory)
+        return;
+    while (const dirent* entry = readdir(directory.get()))
+        listing.entries.emplace_back(entry->d_name, entry->d_type);
+    std::sort(listing.entries.begin(), listing.entries.end());
+    listing.read = true;
+}
+
+// What the listing tells of an entry without asking the kernel: that it is missing,
+// or that it is there and no link. Nothing when only readlink() can tell.
+std::optional<CanonicalStep> listed_step(const DirectoryListing& listing, const std::string& path,
+                                         std::string_view name)
+{
+    if (!listing.read)
+        return std::nullopt;
+    const auto found = std::lower_bound(listing.entries.begin(), listing.entries.end(), name,
+                                        [](const auto& entry, std::string_view wanted) { return entry.first < wanted; });
+    if (found == listing.entries.end() || found->first != name)
+        return CanonicalStep{};
+    if (found->second == DT_LNK || found->second == DT_UNKNOWN)
+        return std::nullopt;
+    return CanonicalStep{path, 0, false};
+}
+
 const CanonicalStep kUndecided{std::nullopt, 0, true};
 const CanonicalStep kLoop{std::nullopt, kMostLinks + 1, false};
 
 struct Stepper {
     std::unordered_map<std::string, CanonicalStep>& steps;
+    std::unordered_map<std::string, DirectoryListing>& listings;
     std::vector<std::string> following;     // the links being followed, innermost last
 
     // The step into `name` inside the canonical directory `dir`, remembered unless it
@@ -71,13 +110,20 @@ struct Stepper {
         if (std::find(following.begin(), following.end(), path) != following.end())
             return kLoop;
 
+        DirectoryListing& listing = listings[dir];
+        if (auto listed = listed_step(listing, path, name))
+            return steps.emplace(std::move(path), std::move(*listed)).first->second;
+
         CanonicalStep outcome;
         std::array<char, PATH_MAX> target{};
         const ssize_t length = readlink(path.c_str(), target.data(), target.size() - 1);
         if (length < 0) {
             // Not a link, so the component is there; any other failure ends the walk.
-            if (errno == EINVAL)
+            if (errno == EINVAL) {
                 outcome.path = path;
+                if (!listing.read && ++listing.plain_entries == 2)
+                    read_listing(dir, listing);
+            }
         } else if (length == 0 || static_cast<std::size_t>(length) >= target.size() - 2) {
             outcome.undecided = true;
         } else {
@@ -124,7 +170,7 @@ const std::optional<std::string>& CanonicalPaths::of(const std::string& path)
     if (!inserted)
         return place->second;
     if (!path.empty() && path[0] == '/') {
-        Stepper stepper{m_steps, {}};
+        Stepper stepper{m_steps, m_listings, {}};
         const CanonicalStep outcome = stepper.walk("/", path);
         if (!outcome.undecided) {
             place->second = outcome.path;

@@ -132,11 +132,13 @@ TEST(AccountNames, FindTheEntriesOfRandomLinesAsTheLibraryDoes)
     // A fixed seed: the same lines every run.
     std::mt19937 random(12);
     const std::string alphabet = std::string("ab:::::+-# \t\r\n\n0123456789x", 26) + std::string(1, '\0');
-    for (int round = 0; round < 1000; ++round) {
+    for (int round = 0; round < 2000; ++round) {
+        // Every other file without a NUL, whose well-formed lines take the short way.
+        const std::size_t letters = alphabet.size() - round % 2;
         std::string content;
         const int length = static_cast<int>(random() % 400);
         for (int i = 0; i < length; ++i)
-            content += alphabet[random() % alphabet.size()];
+            content += alphabet[random() % letters];
         expect_same_names(content, ("random file " + std::to_string(round)).c_str());
     }
 }
