@@ -2,106 +2,50 @@
 // find: the same names, in the same order, on well-formed files and on odd ones.
 #include <gtest/gtest.h>
 
-#include <cstdio>
-#include <cstdlib>
 #include <grp.h>
 #include <pwd.h>
 #include <random>
-#include <string>
-#include <unistd.h>
 #include <vector>
 
+#include "support.h"
 #include "volumes/account_names.h"
 
 namespace {
 
-class TemporaryFile {
-public:
-    explicit TemporaryFile(const std::string& content)
-    {
-        const char* dir = std::getenv("TMPDIR");
-        m_path = std::string(dir && *dir ? dir : "/tmp") + "/account-names-XXXXXX";
-        const int fd = mkstemp(m_path.data());
-        EXPECT_GE(fd, 0);
-        EXPECT_EQ(write(fd, content.data(), content.size()), static_cast<ssize_t>(content.size()));
-        close(fd);
-    }
-    ~TemporaryFile() { unlink(m_path.c_str()); }
-    TemporaryFile(const TemporaryFile&) = delete;
-    TemporaryFile& operator=(const TemporaryFile&) = delete;
-    const char* path() const { return m_path.c_str(); }
-
-private:
-    std::string m_path;
-};
-
-std::vector<std::string> library_names(const char* path, AccountFile kind)
+void expect_same_names(const std::string& content, const std::string& what)
 {
-    std::vector<std::string> names;
-    const UniqueFile file = open_file(path, "r");
-    if (kind == AccountFile::Passwd) {
-        while (const passwd* entry = fgetpwent(file.get()))
-            names.emplace_back(entry->pw_name);
-    } else {
-        while (const group* entry = fgetgrent(file.get()))
-            names.emplace_back(entry->gr_name);
-    }
-    return names;
-}
-
-std::vector<std::string> our_names(const char* path, AccountFile kind)
-{
-    std::vector<std::string> names;
-    EXPECT_TRUE(for_each_account_name(path, kind, [&](std::string_view name) { names.emplace_back(name); }));
-    return names;
-}
-
-// The content with its control characters visible, for a failure message.
-std::string shown(const std::string& content)
-{
-    std::string text;
-    for (const char c : content) {
-        if (c == '\n')
-            text += "\\n";
-        else if (c == '\r')
-            text += "\\r";
-        else if (c == '\t')
-            text += "\\t";
-        else if (c == '\0')
-            text += "\\0";
-        else
-            text += c;
-    }
-    return text;
-}
-
-void expect_same_names(const std::string& content, const char* what)
-{
-    const TemporaryFile file(content);
+    const Scratch dir;
+    const std::string path = dir / "accounts";
+    spit(path, content);
     for (const AccountFile kind : {AccountFile::Passwd, AccountFile::Group}) {
-        const auto expected = library_names(file.path(), kind);
-        EXPECT_EQ(our_names(file.path(), kind), expected)
-            << what << (kind == AccountFile::Passwd ? " (passwd)" : " (group)")
-            << (content.size() < 1000 ? ": " + shown(content) : std::string());
+        std::vector<std::string> library, ours;
+        const UniqueFile file = open_file(path.c_str(), "r");
+        if (kind == AccountFile::Passwd) {
+            while (const passwd* entry = fgetpwent(file.get()))
+                library.emplace_back(entry->pw_name);
+        } else {
+            while (const group* entry = fgetgrent(file.get()))
+                library.emplace_back(entry->gr_name);
+        }
+        EXPECT_TRUE(for_each_account_name(path.c_str(), kind, [&](std::string_view name) { ours.emplace_back(name); }));
+        EXPECT_EQ(ours, library) << what << (kind == AccountFile::Passwd ? " (passwd)" : " (group)")
+                                 << (content.size() < 1000 ? ": " + testing::PrintToString(content) : "");
     }
 }
 
 std::string repeated(const std::string& piece, int times)
 {
     std::string text;
-    for (int i = 0; i < times; ++i)
+    while (times-- > 0)
         text += piece;
     return text;
 }
 
 } // namespace
 
-TEST(AccountNames, FindTheEntriesOfOddLinesAsTheLibraryDoes)
+TEST(AccountNames, FindTheEntriesOfOddAndRandomLinesAsTheLibraryDoes)
 {
-    const struct {
-        const char* what;
-        std::string content;
-    } cases[] = {
+    const std::pair<const char*, std::string> cases[] = {
         {"device files", "root:x:0:0:root:/home/root:/bin/sh\nadmin:x:500:1001:Administrator,,,,:/shares:/bin/sh\n"
                          "allaccount:x:1000:admin,alice\nfamily:x:1004:\n"},
         {"comments and blank lines", "# root:x:0:0::/:\n\n   \n\t# x:x:1:1::/:\n  alice:x:1:2::/:\n\r\n"},
@@ -118,27 +62,22 @@ TEST(AccountNames, FindTheEntriesOfOddLinesAsTheLibraryDoes)
         {"last line without line end", "a:x:1:2::/:\nb:x:3:4::/:"},
         {"empty file", ""},
         {"group line past a block", "root:x:0:\nallaccount:x:1000:" + repeated("user,", 60000) + "end\nlast:x:9:\n"},
-        {"name past a block", repeated("n", 200000) + ":x:1:2:" + repeated("m", 70000) + "\nz:x:1:2\n"},
-        {"decided only past a block", repeated("n", 70000) + ":x:" + repeated(" ", 70000) + "12:13:\n"},
-        {"NUL past a block", repeated("n", 70000) + std::string(1, '\0') + ":x:1:1\nz:x:1:2\n"},
-        {"long last line", "a:x:1:2\n" + repeated("b", 100000)},
+        {"name past a block", std::string(200000, 'n') + ":x:1:2:" + std::string(70000, 'm') + "\nz:x:1:2\n"},
+        {"decided only past a block", std::string(70000, 'n') + ":x:" + std::string(70000, ' ') + "12:13:\n"},
+        {"NUL past a block", std::string(70000, 'n') + std::string(1, '\0') + ":x:1:1\nz:x:1:2\n"},
+        {"long last line", "a:x:1:2\n" + std::string(100000, 'b')},
     };
-    for (const auto& c : cases)
-        expect_same_names(c.content, c.what);
-}
-
-TEST(AccountNames, FindTheEntriesOfRandomLinesAsTheLibraryDoes)
-{
-    // A fixed seed: the same lines every run.
+    for (const auto& [what, content] : cases)
+        expect_same_names(content, what);
+    // Random files from a fixed seed: the same lines every run.
     std::mt19937 random(12);
     const std::string alphabet = std::string("ab:::::+-# \t\r\n\n0123456789x", 26) + std::string(1, '\0');
     for (int round = 0; round < 2000; ++round) {
         // Every other file without a NUL, whose well-formed lines take the short way.
         const std::size_t letters = alphabet.size() - round % 2;
-        std::string content;
-        const int length = static_cast<int>(random() % 400);
-        for (int i = 0; i < length; ++i)
-            content += alphabet[random() % letters];
-        expect_same_names(content, ("random file " + std::to_string(round)).c_str());
+        std::string content(random() % 400, ' ');
+        for (char& c : content)
+            c = alphabet[random() % letters];
+        expect_same_names(content, "random file " + std::to_string(round));
     }
 }

@@ -2,95 +2,53 @@
 // beside it, and on failure the old state untouched and no temporary file.
 #include <gtest/gtest.h>
 
-#include <cstdlib>
-#include <filesystem>
-#include <fstream>
-#include <sstream>
-#include <string>
 #include <sys/stat.h>
 
 #include "cgi/atomic_file.h"
-
-namespace fs = std::filesystem;
+#include "support.h"
 
 namespace {
 
-class Folder {
-public:
-    Folder()
-    {
-        std::string pattern = (fs::temp_directory_path() / "atomic-XXXXXX").string();
-        if (mkdtemp(pattern.data()) == nullptr)
-            throw std::runtime_error("mkdtemp");
-        m_path = pattern;
-    }
-    ~Folder() { fs::remove_all(m_path); }
-    std::string operator/(const std::string& name) const { return (m_path / name).string(); }
-    std::size_t entries() const
-    {
-        return static_cast<std::size_t>(std::distance(fs::directory_iterator(m_path), fs::directory_iterator()));
-    }
-
-private:
-    fs::path m_path;
-};
-
-std::string slurp(const std::string& path)
+unsigned mode_of(const std::string& path)
 {
-    std::ifstream in(path, std::ios::binary);
-    std::ostringstream content;
-    content << in.rdbuf();
-    return content.str();
+    struct stat info {};
+    return stat(path.c_str(), &info) == 0 ? info.st_mode & 07777 : 0;
 }
+
+std::size_t entries(const Scratch& dir) { return std::distance(fs::directory_iterator(dir.path), {}); }
 
 } // namespace
 
-TEST(AtomicFile, ReplacesTheContentAndKeepsThePermissions)
+TEST(AtomicFile, ReplacesKeepingThePermissionsOrLeavesTheOldState)
 {
-    Folder folder;
-    const std::string path = folder / "shadow";
-    std::ofstream(path) << "old\n";
-    ASSERT_EQ(chmod(path.c_str(), 0600), 0);
-    ASSERT_TRUE(replace_file(path, "new\ncontent\n"));
-    EXPECT_EQ(slurp(path), "new\ncontent\n");
-    struct stat info {};
-    ASSERT_EQ(stat(path.c_str(), &info), 0);
-    EXPECT_EQ(info.st_mode & 07777, 0600u);
-    EXPECT_EQ(folder.entries(), 1u);
-}
-
-TEST(AtomicFile, CreatesAMissingFileReadableByAll)
-{
-    Folder folder;
-    const std::string path = folder / "exports";
-    ASSERT_TRUE(replace_file(path, ""));
-    EXPECT_EQ(slurp(path), "");
-    struct stat info {};
-    ASSERT_EQ(stat(path.c_str(), &info), 0);
-    EXPECT_EQ(info.st_mode & 07777, 0644u);
-}
-
-TEST(AtomicFile, AFailureLeavesTheOldStateAndNoTemporaryFile)
-{
-    Folder folder;
-    // The folder is missing: nothing can be written.
-    EXPECT_FALSE(replace_file(folder / "missing/file", "x"));
-    EXPECT_FALSE(fs::exists(folder / "missing"));
+    const Scratch dir;
+    spit(dir / "shadow", "old\n");
+    ASSERT_EQ(chmod((dir / "shadow").c_str(), 0600), 0);
+    ASSERT_TRUE(replace_file(dir / "shadow", "new\ncontent\n"));
+    EXPECT_EQ(slurp(dir / "shadow"), "new\ncontent\n");
+    EXPECT_EQ(mode_of(dir / "shadow"), 0600u);
+    EXPECT_EQ(entries(dir), 1u);
+    // A missing file is made readable by all.
+    ASSERT_TRUE(replace_file(dir / "exports", ""));
+    EXPECT_EQ(mode_of(dir / "exports"), 0644u);
+    // Nothing can be written into a missing folder.
+    EXPECT_FALSE(replace_file(dir / "missing/file", "x"));
+    EXPECT_FALSE(fs::exists(dir / "missing"));
     // The rename fails (a folder stands at the path): it stays, the temporary goes.
-    fs::create_directory(folder / "taken");
-    std::ofstream(folder / "taken/inside") << "kept";
-    EXPECT_FALSE(replace_file(folder / "taken", "x"));
-    EXPECT_EQ(slurp(folder / "taken/inside"), "kept");
-    EXPECT_EQ(folder.entries(), 1u);
+    fs::create_directory(dir / "taken");
+    spit(dir / "taken/inside", "kept");
+    EXPECT_FALSE(replace_file(dir / "taken", "x"));
+    EXPECT_EQ(slurp(dir / "taken/inside"), "kept");
+    EXPECT_EQ(entries(dir), 3u);
 }
 
 TEST(AtomicFile, ReadsAWholeFileOrReportsItMissing)
 {
-    Folder folder;
+    const Scratch dir;
     std::string content = "stale";
-    EXPECT_FALSE(read_whole_file(folder / "none", content));
+    EXPECT_FALSE(read_whole_file(dir / "none", content));
     const std::string big(200000, 'x');
-    std::ofstream(folder / "big") << big;
-    ASSERT_TRUE(read_whole_file(folder / "big", content));
+    spit(dir / "big", big);
+    ASSERT_TRUE(read_whole_file(dir / "big", content));
     EXPECT_EQ(content, big);
 }

@@ -5,86 +5,58 @@
 
 #include <array>
 #include <climits>
-#include <cstdlib>
-#include <filesystem>
-#include <string>
 #include <vector>
 
 #include "nfs/canonical_paths.h"
-
-namespace fs = std::filesystem;
+#include "support.h"
 
 namespace {
 
 std::optional<std::string> system_realpath(const std::string& path)
 {
     std::array<char, PATH_MAX> resolved{};
-    if (realpath(path.c_str(), resolved.data()) == nullptr)
-        return std::nullopt;
-    return std::string(resolved.data());
+    return realpath(path.c_str(), resolved.data()) ? std::optional<std::string>(resolved.data()) : std::nullopt;
 }
-
-class LinkTree : public ::testing::Test {
-protected:
-    void SetUp() override
-    {
-        const char* tmp = std::getenv("TMPDIR");
-        std::string pattern = std::string(tmp && *tmp ? tmp : "/tmp") + "/canonical-XXXXXX";
-        ASSERT_NE(mkdtemp(pattern.data()), nullptr);
-        root = pattern;
-        fs::create_directories(root + "/mnt/HD/HD_a2/Public");
-        fs::create_directories(root + "/mnt/HD/HD_a2/share1/inner");
-        fs::create_directories(root + "/shares");
-        { std::FILE* file = std::fopen((root + "/mnt/HD/HD_a2/file.txt").c_str(), "w"); std::fclose(file); }
-        link(root + "/shares", root + "/nfs");
-        link(root + "/mnt/HD/HD_a2/Public", root + "/shares/Public");
-        link(root + "/mnt/HD/HD_a2/share1", root + "/shares/share1");
-        link("../mnt/HD/HD_a2/share1/inner", root + "/shares/relative");
-        link("HD_a2", root + "/mnt/HD/alias");
-        link(root + "/mnt/HD/HD_a2/file.txt", root + "/shares/file");
-        link(root + "/nowhere", root + "/shares/dangling");
-        link(root + "/shares/loop2", root + "/shares/loop1");
-        link(root + "/shares/loop1", root + "/shares/loop2");
-        link(root + "/mnt/HD/HD_a2/share1/", root + "/shares/trailing");
-        link(".", root + "/shares/dot");
-        // A chain of links: chain0 -> chain1 -> ... -> chain44 -> Public.
-        link(root + "/mnt/HD/HD_a2/Public", root + "/shares/chain44");
-        for (int i = 43; i >= 0; --i)
-            link(root + "/shares/chain" + std::to_string(i + 1), root + "/shares/chain" + std::to_string(i));
-    }
-    void TearDown() override { fs::remove_all(root); }
-
-    static void link(const std::string& target, const std::string& at) { fs::create_symlink(target, at); }
-
-    std::string root;
-};
 
 } // namespace
 
-TEST_F(LinkTree, ResolvesEveryPathAsRealpathDoes)
+TEST(CanonicalPaths, ResolveEveryPathAsRealpathDoes)
 {
-    const std::vector<std::string> tails = {
-        "/nfs/Public", "/nfs/share1", "/nfs/share1/inner", "/shares/Public", "/shares/relative",
-        "/mnt/HD/alias/share1", "/mnt/HD/alias/file.txt", "/shares/file", "/shares/file/more", "/shares/dangling",
-        "/shares/loop1", "/shares/loop2/x", "/shares/trailing", "/shares/trailing/inner", "/shares/dot",
-        "/shares/dot/Public", "/nfs/../nfs/Public", "/nfs/./Public", "/nfs/Public/", "/nfs//Public",
-        "/nfs/missing", "/mnt/HD/HD_a2/file.txt/", "/shares/chain5", "/shares/chain4", "/shares/chain0",
-        "/nfs/chain5", "/nfs/chain3", "/nfs/chain4/..", "",
+    const Scratch dir;
+    const std::string root = dir.path.string();
+    for (const char* folder : {"/mnt/HD/HD_a2/Public", "/mnt/HD/HD_a2/share1/inner", "/shares"})
+        fs::create_directories(root + folder);
+    spit(root + "/mnt/HD/HD_a2/file.txt", "");
+    // Each link: where it points, and where it is (in the tree).
+    std::vector<std::pair<std::string, std::string>> links = {
+        {root + "/shares", "/nfs"}, {root + "/mnt/HD/HD_a2/Public", "/shares/Public"},
+        {root + "/mnt/HD/HD_a2/share1", "/shares/share1"}, {"../mnt/HD/HD_a2/share1/inner", "/shares/relative"},
+        {"HD_a2", "/mnt/HD/alias"}, {root + "/mnt/HD/HD_a2/file.txt", "/shares/file"},
+        {root + "/nowhere", "/shares/dangling"}, {root + "/shares/loop2", "/shares/loop1"},
+        {root + "/shares/loop1", "/shares/loop2"}, {root + "/mnt/HD/HD_a2/share1/", "/shares/trailing"},
+        {".", "/shares/dot"}, {root + "/mnt/HD/HD_a2/Public", "/shares/chain44"},
     };
-    std::vector<std::string> paths;
-    for (const std::string& tail : tails)
-        paths.push_back(tail.empty() ? std::string() : root + tail);
-    paths.push_back("relative/path");
-    paths.push_back("/");
+    for (int i = 43; i >= 0; --i)   // chain0 -> chain1 -> ... -> chain44 -> Public
+        links.emplace_back(root + "/shares/chain" + std::to_string(i + 1), "/shares/chain" + std::to_string(i));
+    for (const auto& [target, at] : links)
+        fs::create_symlink(target, root + at);
 
+    std::vector<std::string> paths = {"", "relative/path", "/"};
+    for (const char* tail : {"/nfs/Public", "/nfs/share1", "/nfs/share1/inner", "/shares/Public", "/shares/relative",
+                             "/mnt/HD/alias/share1", "/mnt/HD/alias/file.txt", "/shares/file", "/shares/file/more",
+                             "/shares/dangling", "/shares/loop1", "/shares/loop2/x", "/shares/trailing",
+                             "/shares/trailing/inner", "/shares/dot", "/shares/dot/Public", "/nfs/../nfs/Public",
+                             "/nfs/./Public", "/nfs/Public/", "/nfs//Public", "/nfs/missing", "/mnt/HD/HD_a2/file.txt/",
+                             "/shares/chain5", "/shares/chain4", "/shares/chain0", "/nfs/chain5", "/nfs/chain3",
+                             "/nfs/chain4/.."})
+        paths.push_back(root + tail);
     // Forwards and then backwards through one memory, and each path through a fresh one.
     CanonicalPaths shared;
     for (int pass = 0; pass < 2; ++pass) {
         for (std::size_t i = 0; i < paths.size(); ++i) {
             const std::string& path = pass == 0 ? paths[i] : paths[paths.size() - 1 - i];
             EXPECT_EQ(shared.of(path), system_realpath(path)) << path;
-            CanonicalPaths fresh;
-            EXPECT_EQ(fresh.of(path), system_realpath(path)) << path;
+            EXPECT_EQ(CanonicalPaths().of(path), system_realpath(path)) << path;
         }
     }
 }

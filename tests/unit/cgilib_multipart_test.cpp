@@ -2,27 +2,15 @@
 // moving an upload into place.
 #include <gtest/gtest.h>
 
-#include <algorithm>
-#include <cstdlib>
-#include <filesystem>
-#include <fstream>
-#include <iterator>
 #include <sys/stat.h>
 #include <vector>
 
 #include "cgilib/temp_file.h"
-#include "cgilib_test_support.h"
-
-using cgilib_test::form_file_name;
-using cgilib_test::form_string;
-using cgilib_test::parse;
-using cgilib_test::Read;
-using cgilib_test::TestRequest;
-namespace fs = std::filesystem;
+#include "support.h"
 
 namespace {
 
-const std::string kType = "multipart/form-data; boundary=XyZ";
+const std::string kType = "multipart/form-data; boundary=XyZ", kEnd = "--XyZ--\r\n";
 
 std::string field(const std::string& name, const std::string& value)
 {
@@ -35,35 +23,11 @@ std::string file(const std::string& name, const std::string& file_name, const st
            "\"\r\nContent-Type: application/octet-stream\r\n\r\n" + content + "\r\n";
 }
 
-const std::string kEnd = "--XyZ--\r\n";
-
-std::string read_file(const fs::path& path)
+// Uploads are stored in the library's own temporary files: this moves one out and
+// reads what arrived.
+std::string renamed_content(const char* name, const Scratch& dir)
 {
-    std::ifstream in(path, std::ios::binary);
-    return {std::istreambuf_iterator<char>(in), {}};
-}
-
-// A directory of its own under /tmp, removed with everything in it.
-struct ScratchDir {
-    std::string pattern;
-    fs::path path;
-    explicit ScratchDir(const fs::path& base = fs::temp_directory_path())
-        : pattern((base / "cgilib-test-XXXXXX").string()), path(::mkdtemp(pattern.data()) ? pattern : "") {}
-    ~ScratchDir()
-    {
-        if (!path.empty())
-            fs::remove_all(path);
-    }
-};
-
-// Uploads are stored in the library's own temporary files; this finds where by
-// moving the upload out and looking at what arrived.
-std::string renamed_content(const char* name, const ScratchDir& dir)
-{
-    const fs::path target = dir.path / name;
-    if (cgiFormFileRename(name, target.c_str()) != cgiFormSuccess)
-        return "<not renamed>";
-    return read_file(target);
+    return cgiFormFileRename(name, (dir / name).c_str()) == cgiFormSuccess ? slurp(dir / name) : "<not renamed>";
 }
 
 } // namespace
@@ -75,7 +39,6 @@ TEST(CgiMultipart, ReadsFieldsAndUploadsByteForByte)
     parse({.content_type = kType,
            .body = "preamble\r\n" + field("name", "alice") + file("upload", "C:\\dir\\users.txt", content) +
                    field("note", "two\r\nlines") + field("name", "bob") + kEnd + "epilogue"});
-
     EXPECT_EQ(form_string("name"), (Read{cgiFormSuccess, "alice"}));
     EXPECT_EQ(form_string("note"), (Read{cgiFormSuccess, "two\r\nlines"}));
     EXPECT_EQ(form_file_name("upload"), (Read{cgiFormSuccess, "C:\\dir\\users.txt"}));
@@ -83,15 +46,9 @@ TEST(CgiMultipart, ReadsFieldsAndUploadsByteForByte)
     EXPECT_EQ(form_file_name("name"), (Read{cgiFormNotAFile, ""}));
     EXPECT_EQ(form_file_name("missing"), (Read{cgiFormNotFound, ""}));
     EXPECT_EQ(form_string("upload"), (Read{cgiFormEmpty, ""}));
-
-    const ScratchDir dir;
+    const Scratch dir;
     EXPECT_EQ(renamed_content("upload", dir), content);
-}
-
-// The body is read in pieces; a delimiter may fall across the seam of two of them.
-TEST(CgiMultipart, FindsDelimitersAcrossReadPieces)
-{
-    const ScratchDir dir;
+    // The body is read in pieces; a delimiter may fall across the seam of two of them.
     for (std::size_t size = 65536 - 80; size < 65536 + 8; size += 3) {
         std::string content(size, 'x');
         for (std::size_t i = 0; i < size; i += 97)
@@ -154,56 +111,48 @@ TEST(CgiMultipart, DropsUnfinishedUploadsAndRemovesOldOnes)
 {
     const auto left = [] {
         std::vector<std::string> found;
-        std::copy_if(g_made.begin(), g_made.end(), std::back_inserter(found),
-                     [](const std::string& path) { return fs::exists(path); });
+        std::copy_if(g_made.begin(), g_made.end(), std::back_inserter(found), [](auto& path) { return fs::exists(path); });
         return found;
     };
     g_made.clear();
     parse({.content_type = kType, .body = file("f", "a.txt", "data") + kEnd});
     ASSERT_EQ(left().size(), 1u);
     EXPECT_TRUE(left()[0].starts_with("/tmp/cgic")) << left()[0];
-
     // The next request replaces this one; a cut upload is not kept either.
     parse({.content_type = kType, .body = file("f", "a.txt", "data") + "--XyZ\r\n" + file("g", "b.txt", "cut")});
     EXPECT_EQ(form_file_name("f").result, cgiFormSuccess);
     EXPECT_EQ(form_file_name("g").result, cgiFormNotFound);
     EXPECT_EQ(g_made.size(), 3u);
     EXPECT_EQ(left(), std::vector<std::string>{g_made[1]});
-
     parse({.method = "GET"});
     EXPECT_TRUE(left().empty());
 }
 
-TEST(CgiFormFileRename, MovesTheUploadIntoAnotherDirectory)
+TEST(CgiFormFileRename, MovesTheUploadIntoAnotherDirectoryOrFileSystem)
 {
-    const ScratchDir dir;
+    const Scratch dir;
     parse({.content_type = kType, .body = file("f", "a.txt", "first") + field("plain", "x") + kEnd});
     fs::create_directory(dir.path / "sub");
-    std::ofstream(dir.path / "sub" / "target") << "old content";
+    spit(dir / "sub/target", "old content");
+    EXPECT_EQ(cgiFormFileRename("plain", (dir / "p").c_str()), cgiFormNotAFile);
+    EXPECT_EQ(cgiFormFileRename("missing", (dir / "m").c_str()), cgiFormNotFound);
+    EXPECT_EQ(cgiFormFileRename("f", (dir / "no-such-dir/t").c_str()), cgiFormIO);
+    EXPECT_EQ(cgiFormFileRename("f", (dir / "sub/target").c_str()), cgiFormSuccess);
+    EXPECT_EQ(slurp(dir / "sub/target"), "first");
+    EXPECT_EQ(cgiFormFileRename("f", (dir / "again").c_str()), cgiFormIO);
 
-    EXPECT_EQ(cgiFormFileRename("plain", (dir.path / "p").c_str()), cgiFormNotAFile);
-    EXPECT_EQ(cgiFormFileRename("missing", (dir.path / "m").c_str()), cgiFormNotFound);
-    EXPECT_EQ(cgiFormFileRename("f", (dir.path / "no-such-dir" / "t").c_str()), cgiFormIO);
-    EXPECT_EQ(cgiFormFileRename("f", (dir.path / "sub" / "target").c_str()), cgiFormSuccess);
-    EXPECT_EQ(read_file(dir.path / "sub" / "target"), "first");
-    EXPECT_EQ(cgiFormFileRename("f", (dir.path / "again").c_str()), cgiFormIO);
-}
-
-// /dev/shm is a file system of its own on most machines: a rename cannot cross to
-// it, so the upload is copied there instead.
-TEST(CgiFormFileRename, CopiesAcrossFileSystems)
-{
+    // /dev/shm is a file system of its own on most machines: a rename cannot cross to
+    // it, so the upload is copied there instead.
     struct stat tmp_stat {}, shm_stat {};
     if (::stat("/tmp", &tmp_stat) != 0 || ::stat("/dev/shm", &shm_stat) != 0 || tmp_stat.st_dev == shm_stat.st_dev)
         GTEST_SKIP() << "no second file system at /dev/shm";
-    const ScratchDir dir("/dev/shm");
+    const Scratch shm("/dev/shm");
     const std::string content = std::string("a\0b\r\n", 5) + std::string(200000, 'z');
-
     auto upload = cgilib::TempFile::create();
     ASSERT_TRUE(upload && upload->write(content) && upload->finish());
     const std::string source = upload->path();
-    EXPECT_TRUE(upload->move_to((dir.path / "moved").string()));
-    EXPECT_EQ(read_file(dir.path / "moved"), content);
+    EXPECT_TRUE(upload->move_to(shm / "moved"));
+    EXPECT_EQ(slurp(shm / "moved"), content);
     EXPECT_FALSE(fs::exists(source));
-    EXPECT_EQ(std::distance(fs::directory_iterator(dir.path), {}), 1);   // no staging file left
+    EXPECT_EQ(std::distance(fs::directory_iterator(shm.path), {}), 1);   // no staging file left
 }
