@@ -88,14 +88,6 @@ std::vector<std::string> base_environment()
     return env;
 }
 
-std::string query_string(std::string_view cmd, const Fields& fields)
-{
-    std::string query = "cmd=" + url_encode(cmd);
-    for (const auto& [name, value] : fields)
-        query += "&" + url_encode(name) + "=" + url_encode(value);
-    return query;
-}
-
 Event split_event(const std::string& line)
 {
     Event event;
@@ -242,11 +234,6 @@ std::string Device::request(std::string_view cmd, const Fields& fields)
     return get_raw(query_string(cmd, fields)).out;
 }
 
-std::string Device::post(std::string_view cmd, const Fields& fields)
-{
-    return post_raw(query_string(cmd, fields), "application/x-www-form-urlencoded").out;
-}
-
 Reply Device::get_raw(std::string_view query)
 {
     return run({kProgram}, {{"REQUEST_METHOD", "GET"}, {"QUERY_STRING", std::string(query)}});
@@ -306,6 +293,14 @@ void Device::clear_records()
     write_file("/var/log/console", "");
 }
 
+std::string query_string(std::string_view cmd, const Fields& fields)
+{
+    std::string query = "cmd=" + url_encode(cmd);
+    for (const auto& [name, value] : fields)
+        query += "&" + url_encode(name) + "=" + url_encode(value);
+    return query;
+}
+
 std::string url_encode(std::string_view value)
 {
     constexpr std::string_view kHex = "0123456789ABCDEF";
@@ -332,19 +327,6 @@ std::string xml_utf8_answer(std::string_view body)
 {
     return "Pragma: no-cache\r\nCache-Control: no-cache\r\nContent-Type: text/xml; charset=utf-8\r\n\r\n"
            "<?xml version=\"1.0\" encoding=\"UTF-8\"?>" + std::string(body);
-}
-
-Journal without(const Journal& journal, std::initializer_list<std::string_view> names)
-{
-    Journal kept;
-    for (const Event& event : journal) {
-        bool drop = false;
-        for (std::string_view name : names)
-            drop = drop || event.at(0) == name;
-        if (!drop)
-            kept.push_back(event);
-    }
-    return kept;
 }
 
 std::vector<std::string> shell_lines(const Journal& journal)

@@ -56,8 +56,6 @@ public:
 
     // GET /cgi-bin/nas-accounts.cgi?cmd=CMD&FIELDS: the answer bytes.
     std::string request(std::string_view cmd, const Fields& fields = {});
-    // The same as a url-encoded POST.
-    std::string post(std::string_view cmd, const Fields& fields = {});
     // A GET with a raw query string, and a POST with a raw body and content type.
     Reply get_raw(std::string_view query);
     Reply post_raw(std::string_view body, std::string_view content_type, std::string_view query = "");
@@ -78,14 +76,13 @@ private:
 
 // Percent-encodes a form value (everything but letters, digits and -_.~).
 std::string url_encode(std::string_view value);
+// "cmd=CMD&NAME=VALUE...", encoded.
+std::string query_string(std::string_view cmd, const Fields& fields);
 
 // The full answers of the shared shapes.
 std::string xml_answer(std::string_view body);          // no-cache, text/xml, prologue, body
 std::string xml_utf8_answer(std::string_view body);     // the same with charset=utf-8
 inline const std::string kEmptyHtml = "Content-Type: text/html\r\n\r\n";
 
-// The journal without the events of the named tools or calls: for tools that run in
-// the background, whose lines may fall anywhere after the command line that started them.
-Journal without(const Journal& journal, std::initializer_list<std::string_view> names);
 // The command lines the program handed to the shell, in order.
 std::vector<std::string> shell_lines(const Journal& journal);
