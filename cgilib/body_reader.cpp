@@ -8,7 +8,7 @@ namespace {
 constexpr std::size_t kChunk = 64 * 1024;
 }
 
-BodyReader::BodyReader(std::istream& in, std::uint64_t length, std::string prefix)
+BodyReader::BodyReader(const ByteSource& in, std::uint64_t length, std::string prefix)
     : m_in(in), m_remaining(length), m_buffer(std::move(prefix))
 {
 }
@@ -28,8 +28,13 @@ bool BodyReader::read_chunk()
     const std::size_t wanted = static_cast<std::size_t>(std::min<std::uint64_t>(kChunk, m_remaining));
     const std::size_t old_size = m_buffer.size();
     m_buffer.resize(old_size + wanted);
-    m_in.read(m_buffer.data() + old_size, static_cast<std::streamsize>(wanted));
-    const auto got = static_cast<std::size_t>(m_in.gcount());
+    std::size_t got = 0;
+    while (got < wanted) {
+        const std::size_t piece = m_in(m_buffer.data() + old_size + got, wanted - got);
+        if (piece == 0)
+            break;
+        got += piece;
+    }
     m_buffer.resize(old_size + got);
     m_remaining -= got;
     if (got < wanted) {

@@ -47,7 +47,7 @@ PartHeaders parse_part_headers(std::string_view block)
 
 class MultipartParser {
 public:
-    MultipartParser(std::istream& body, std::uint64_t length, std::string_view boundary)
+    MultipartParser(const ByteSource& body, std::uint64_t length, std::string_view boundary)
         : m_reader(body, length, std::string(kLineBreak)), m_delimiter("\r\n--" + std::string(boundary))
     {
     }
@@ -137,7 +137,7 @@ std::optional<std::string> multipart_boundary(std::string_view content_type)
     return boundary;
 }
 
-FormFields parse_multipart(std::istream& body, std::uint64_t length, std::string_view boundary)
+FormFields parse_multipart(const ByteSource& body, std::uint64_t length, std::string_view boundary)
 {
     return MultipartParser(body, length, boundary).parse();
 }

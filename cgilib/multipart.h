@@ -2,7 +2,6 @@
 #pragma once
 
 #include <cstdint>
-#include <istream>
 #include <optional>
 #include <string>
 #include <string_view>
@@ -22,6 +21,10 @@ std::optional<std::string> multipart_boundary(std::string_view content_type);
 // complete header block, one cut off by the end of the body. Whatever follows the
 // closing delimiter is ignored and not read. When the input ends before `length`
 // bytes while parts are still being read, the body gives no fields at all.
-FormFields parse_multipart(std::istream& body, std::uint64_t length, std::string_view boundary);
+FormFields parse_multipart(const ByteSource& body, std::uint64_t length, std::string_view boundary);
+inline FormFields parse_multipart(std::istream& body, std::uint64_t length, std::string_view boundary)
+{
+    return parse_multipart(stream_source(body), length, boundary);
+}
 
 } // namespace cgilib

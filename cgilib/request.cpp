@@ -36,7 +36,7 @@ std::optional<std::uint64_t> content_length(std::string_view text)
     return length;
 }
 
-FormFields read_urlencoded_body(std::istream& body, std::uint64_t length)
+FormFields read_urlencoded_body(const ByteSource& body, std::uint64_t length)
 {
     // Read in pieces: memory grows with what arrives, not with what was announced.
     BodyReader reader(body, length);
@@ -47,7 +47,7 @@ FormFields read_urlencoded_body(std::istream& body, std::uint64_t length)
     return fields;
 }
 
-FormFields read_body(const CgiEnvironment& environment, std::istream& body)
+FormFields read_body(const CgiEnvironment& environment, const ByteSource& body)
 {
     const auto length = content_length(environment.content_length);
     if (environment.request_method != "POST" || !length || *length == 0)
@@ -68,7 +68,7 @@ CgiEnvironment environment_from_process()
             variable("CONTENT_LENGTH")};
 }
 
-void parse_request(const CgiEnvironment& environment, std::istream& body)
+void parse_request(const CgiEnvironment& environment, const ByteSource& body)
 {
     FormFields fields = read_body(environment, body);
     parse_urlencoded(environment.query_string, fields);

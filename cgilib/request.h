@@ -4,12 +4,12 @@
 
 #include <cstddef>
 #include <cstdint>
-#include <istream>
 #include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
 
+#include "cgilib/body_reader.h"
 #include "cgilib/temp_file.h"
 
 namespace cgilib {
@@ -53,7 +53,11 @@ CgiEnvironment environment_from_process();
 // in body order, then the query string's.
 // A body that ends before CONTENT_LENGTH bytes (a multipart one: before its closing
 // delimiter) is dropped whole: a cut request must not act on a cut value.
-void parse_request(const CgiEnvironment& environment, std::istream& body);
+void parse_request(const CgiEnvironment& environment, const ByteSource& body);
+inline void parse_request(const CgiEnvironment& environment, std::istream& body)
+{
+    parse_request(environment, stream_source(body));
+}
 // The same for a request without a body to read (anything but a POST).
 void parse_request(const CgiEnvironment& environment);
 

@@ -108,8 +108,13 @@ int main(int argc, char** argv)
         return 2;
     }
 
-    // Orphans of the command (background tools) become our children, so we can wait for them.
-    prctl(PR_SET_CHILD_SUBREAPER, 1);
+    // Orphans of the command (background tools) must become our children, so we can wait
+    // for them: as the first process of the sandbox they are anyway; otherwise we ask to be
+    // their reaper (which an emulator such as qemu-user may refuse).
+    if (getpid() != 1 && prctl(PR_SET_CHILD_SUBREAPER, 1) != 0) {
+        std::fprintf(stderr, "devinit: cannot become the reaper of background jobs: %s\n", std::strerror(errno));
+        return 1;
+    }
 
     sigset_t signals;
     sigemptyset(&signals);

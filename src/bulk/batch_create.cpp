@@ -29,11 +29,12 @@ constexpr const char* kBatchRecordFile = "/tmp/account_batch_info";
 // stay under 39 000 bytes.
 constexpr int kBatchLineSize = 49152;
 // The most records one request writes: a larger "f_number" writes this many.
-constexpr long kMaxBatchRecords = 10000;
+constexpr long long kMaxBatchRecords = 10000;
 
-long decimal(const char* text)
+// 64 bits on every device, so that a number beyond the int range is seen as one there too.
+long long decimal(const char* text)
 {
-    return std::strtol(text, nullptr, 10);
+    return std::strtoll(text, nullptr, 10);
 }
 
 // A record field may not hold the record file's separators.
@@ -61,7 +62,7 @@ void cgi_user_batch_create()
     // The names are the prefix and a number; a prefix no name may begin with, a field
     // that would split its record, or a first number that the names cannot hold
     // (beyond the int range) writes no record and starts nothing.
-    const long first = decimal(start.c_str());
+    const long long first = decimal(start.c_str());
     const char* refused = nullptr;
     if (!is_acceptable_name(prefix.view()))
         refused = "f_prefix";
@@ -89,9 +90,9 @@ void cgi_user_batch_create()
     // three digits, a start of "1" does not pad at all. They stop at the most records
     // one request writes, and at the last number an int holds: never a wrapped one.
     const int width = static_cast<int>(start.length());
-    const long count = std::clamp(decimal(number.c_str()), 0L, kMaxBatchRecords);
-    const long end = std::min(first + count, static_cast<long>(std::numeric_limits<int>::max()) + 1);
-    long last = -1;
+    const long long count = std::clamp(decimal(number.c_str()), 0LL, kMaxBatchRecords);
+    const long long end = std::min(first + count, static_cast<long long>(std::numeric_limits<int>::max()) + 1);
+    long long last = -1;
     // The records are gathered first and replace the record file at once, under its
     // lock: an account_mgr run still working on the previous batch has read its whole
     // file already (sim/tools/account_mgr.cpp tells how runs follow each other).
@@ -99,10 +100,10 @@ void cgi_user_batch_create()
     // tool is still started and the event still logged.
     try {
         std::string records;
-        long current = first;
+        long long current = first;
         while (current < end) {
             FixedText<32> name;
-            name.format("%s%0*ld", prefix.c_str(), width, current);
+            name.format("%s%0*lld", prefix.c_str(), width, current);
             ++current;
             // account_mgr reads the columns by position: the write list stands before
             // the read list.
@@ -129,7 +130,7 @@ void cgi_user_batch_create()
 
     // The event names the numeric range, unpadded: user001 to user010 is user1-user10.
     FixedText<64> range;
-    range.format("%s%d-%s%ld", prefix.c_str(), static_cast<int>(first), prefix.c_str(), last);
+    range.format("%s%d-%s%lld", prefix.c_str(), static_cast<int>(first), prefix.c_str(), last);
     log_event("Account \"%s\" has been created.", range.c_str());
     answer_empty_html();
 }

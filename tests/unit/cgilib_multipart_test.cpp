@@ -94,18 +94,21 @@ TEST(CgiMultipart, LeavesOutWhatCannotBeRead)
     }
 }
 
-// The library makes its upload files with mkostemp, which the unit tests' link points
-// here: the tests watch only the files this process made, whatever other processes
-// (the fuzzer, a device test's import) store beside them in /tmp meanwhile.
+// The library makes its upload files with mkostemp (mkostemp64 where 32-bit targets
+// build with 64-bit file offsets), which the unit tests' link points here: the tests
+// watch only the files this process made, whatever other processes (the fuzzer, a
+// device test's import) store beside them in /tmp meanwhile.
 std::vector<std::string> g_made;
-extern "C" int __real_mkostemp(char* pattern, int flags);
-extern "C" int __wrap_mkostemp(char* pattern, int flags)
+int remembered(int fd, const char* pattern)
 {
-    const int fd = __real_mkostemp(pattern, flags);
     if (fd >= 0)
         g_made.emplace_back(pattern);
     return fd;
 }
+extern "C" int __real_mkostemp(char* pattern, int flags);
+extern "C" int __wrap_mkostemp(char* pattern, int flags) { return remembered(__real_mkostemp(pattern, flags), pattern); }
+extern "C" int __real_mkostemp64(char* pattern, int flags);
+extern "C" int __wrap_mkostemp64(char* pattern, int flags) { return remembered(__real_mkostemp64(pattern, flags), pattern); }
 
 TEST(CgiMultipart, DropsUnfinishedUploadsAndRemovesOldOnes)
 {
