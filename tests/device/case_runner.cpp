@@ -46,9 +46,10 @@
 #include <filesystem>
 #include <fstream>
 #include <map>
+#include <set>
 #include <sstream>
 
-#include "accounts_testing.h"
+#include "device.h"
 
 namespace fs = std::filesystem;
 
@@ -295,14 +296,13 @@ public:
 private:
     static bool is_request(const std::string& text)
     {
-        const std::string head = split_first(text).first;
-        return head == "get" || head == "post" || head == "raw" || head == "body" || head == "run";
+        static const std::set<std::string> heads = {"get", "post", "raw", "body", "run"};
+        return heads.count(split_first(text).first) > 0;
     }
     static bool is_setup(const std::string& text)
     {
-        const std::string head = split_first(text).first;
-        return head == "file" || head == "append" || head == "rm" || head == "config" || head == "volumes" ||
-               head == "trace" || head == "program" || head == "link";
+        static const std::set<std::string> heads = {"file", "append", "rm", "config", "volumes", "trace", "program", "link"};
+        return heads.count(split_first(text).first) > 0;
     }
 
     // The files that the request at `at` must leave as they are, read before it runs.
@@ -336,10 +336,10 @@ private:
                 argv[0] = "/sbin/" + argv[0];
             }
             const Reply reply = head == "run"    ? m_dev.run(argv)
-                                : head == "get"  ? m_dev.get_raw(query)
-                                : head == "post" ? m_dev.post_raw(query, "application/x-www-form-urlencoded")
-                                : head == "raw"  ? m_dev.get_raw(arg)
-                                                 : m_dev.post_raw(unescaped(rest.substr(rest.find(' ', rest[0] == '"' ? rest.find('"', 1) : 0) + 1)), items.at(0));
+                                : head == "get"  ? m_dev.get(query)
+                                : head == "post" ? m_dev.post(query)
+                                : head == "raw"  ? m_dev.get(arg)
+                                                 : m_dev.post(unescaped(rest.substr(rest.find(' ', rest[0] == '"' ? rest.find('"', 1) : 0) + 1)), items.at(0));
             m_pending->got = reply.out;
             m_pending->status = reply.status;
             m_pending->err = reply.err;
@@ -362,18 +362,15 @@ private:
             m_dev.remove(first);
             m_dev.write_file(first, unescaped(second));
             if (head == "program")
-                fs::permissions(m_dev.host_path(first), fs::perms(0755));
+                fs::permissions(m_dev.root() + first, fs::perms(0755));
         } else if (head == "rm") {
             m_dev.remove(rest);
         } else if (head == "config") {
-            if (second.empty() && rest.find(' ') == std::string::npos)
-                m_dev.remove_config(first);
-            else
-                m_dev.config({{first, unescaped(second)}});
+            m_dev.config(first, rest.find(' ') == std::string::npos ? std::nullopt : std::optional(unescaped(second)));
         } else if (head == "link") {
             m_dev.symlink(second, first);
         } else if (head == "trace") {
-            m_dev.trace_on();
+            m_dev.write_file("/tmp/cgi_debug", "");
         } else {
             // Disks of 1877538, 937795, 4096 and 2048 megabytes for HD_a2 to HD_d2.
             static const std::map<std::string, std::string> tables = {
@@ -396,7 +393,7 @@ private:
         if (head == "xml")
             p.answer = xml_answer(arg);
         else if (head == "utf8")
-            p.answer = xml_utf8_answer(arg);
+            p.answer = xml_answer(arg, true);
         else if (head == "html")
             p.answer = kEmptyHtml;
         else if (head == "answer" && rest == "any")
@@ -461,9 +458,9 @@ private:
             EXPECT_EQ(kept, p.journal) << where << ": the journal was\n" << shown(kept) << "expected\n" << shown(p.journal);
         }
         if (!p.log_any) {
-            EXPECT_EQ(m_dev.messages(), p.log) << where;
+            EXPECT_EQ(m_dev.lines("/var/log/messages"), p.log) << where;
         }
-        EXPECT_EQ(m_dev.console(), p.console) << where;
+        EXPECT_EQ(m_dev.read_file("/var/log/console"), p.console) << where;
         m_pending.reset();
     }
 
