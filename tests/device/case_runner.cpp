@@ -164,10 +164,11 @@ void expand(const std::string& call, int number, const std::map<std::string, std
     }
 }
 
-std::vector<Case> load(const fs::path& path)
+// Adds the cases of one file.
+void load(const fs::path& path, std::vector<Case>& cases)
 {
     std::ifstream in(path);
-    std::vector<Case> cases;
+    const std::size_t first = cases.size();
     std::map<std::string, std::string> names;
     std::map<std::string, std::vector<std::string>> blocks;
     std::string text, open_block;
@@ -195,7 +196,7 @@ std::vector<Case> load(const fs::path& path)
             blocks[rest].clear();
         } else if (head == "case") {
             cases.push_back({path.stem().string(), rest, {}});
-        } else if (cases.empty()) {
+        } else if (cases.size() == first) {
             throw std::runtime_error(path.string() + ":" + std::to_string(number) + ": a line before the first case");
         } else if (head[0] == '@') {
             expand(text, number, blocks, names, cases.back().lines);
@@ -203,17 +204,13 @@ std::vector<Case> load(const fs::path& path)
             cases.back().lines.push_back({number, text});
         }
     }
-    return cases;
 }
 
 std::vector<Case> all_cases()
 {
-    const std::set<fs::path> files(fs::directory_iterator(NAS_SOURCE_DIR "/tests/device/cases"), fs::directory_iterator());
     std::vector<Case> cases;
-    for (const fs::path& file : files) {
-        auto found = load(file);
-        cases.insert(cases.end(), found.begin(), found.end());
-    }
+    for (const fs::path& file : std::set<fs::path>(fs::directory_iterator(NAS_SOURCE_DIR "/tests/device/cases"), fs::directory_iterator()))
+        load(file, cases);
     return cases;
 }
 
@@ -253,8 +250,7 @@ struct Pending {
     int line = 0;
     std::optional<std::string> answer;     // nullopt: not given
     bool answer_any = false, journal_any = false, log_any = false;
-    std::string got, err;
-    int status = -1;
+    Reply reply;
     Journal journal;
     std::vector<std::string> drop;
     std::vector<std::string> log;
@@ -318,14 +314,11 @@ private:
                 m_dev.install_probe(argv[0]);
                 argv[0] = "/sbin/" + argv[0];
             }
-            const Reply reply = head == "run"    ? m_dev.run(argv)
+            m_pending->reply = head == "run"    ? m_dev.run(argv)
                                 : head == "get"  ? m_dev.get(query)
                                 : head == "post" ? m_dev.post(query)
                                 : head == "raw"  ? m_dev.get(arg)
                                                  : m_dev.post(unescaped(rest.substr(rest.find(' ', rest[0] == '"' ? rest.find('"', 1) : 0) + 1)), items.at(0));
-            m_pending->got = reply.out;
-            m_pending->status = reply.status;
-            m_pending->err = reply.err;
         } else if (is_setup(text)) {
             settle();
             setup(head, rest);
@@ -426,11 +419,11 @@ private:
             return;
         const Pending& p = *m_pending;
         const std::string where = m_case.file + ".cases:" + std::to_string(p.line);
-        EXPECT_EQ(p.status, 0) << where << ": the program ended badly:\n" << p.err;
+        EXPECT_EQ(p.reply.status, 0) << where << ": the program ended badly:\n" << p.reply.err;
         if (p.answer)
-            EXPECT_EQ(p.got, *p.answer) << where;
+            EXPECT_EQ(p.reply.out, *p.answer) << where;
         else if (!p.answer_any)
-            ADD_FAILURE() << where << ": the request has no expected answer; it answered:\n" << p.got;
+            ADD_FAILURE() << where << ": the request has no expected answer; it answered:\n" << p.reply.out;
         if (!p.journal_any) {
             const Journal got = m_dev.journal();
             Journal kept;
