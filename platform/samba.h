@@ -5,11 +5,10 @@
 extern "C" {
 #endif
 
-// The share list that get_samba_info2() fills, in the library's stable order. The
-// path (at most 4095 characters) is held by the record itself, after its fields.
+// The share list that get_samba_info2() fills, in the library's stable order.
 struct share_info {
     char name[80];
-    char* path;
+    char path[4096];
     struct share_info* next;
 };
 extern struct share_info* pss;
@@ -17,13 +16,12 @@ int get_samba_info2(void);
 // Releases the lists the library filled: pss, pdfs and pnl.
 void Free_All_List(void);
 
-// DFS link records that get_dfs_info() fills. Each text (at most 511 characters) is
-// held by the record itself, after its fields.
+// DFS link records that get_dfs_info() fills.
 struct dfs_info {
-    char* host;             // the remote host (second cell of the link grid)
-    char* share;            // the remote share (third cell; the sharename look-up)
-    char* link;             // the link's own name (first cell)
-    char* group;            // the DFS group the link belongs to
+    char host[512];         // the remote host (second cell of the link grid)
+    char share[512];        // the remote share (third cell; the sharename look-up)
+    char link[512];         // the link's own name (first cell)
+    char group[512];        // the DFS group the link belongs to
     struct dfs_info* next;
 };
 extern struct dfs_info* pdfs;

@@ -1,15 +1,32 @@
 #include "dfs_store.h"
 
+#include <array>
+
 #include "text_file.h"
+
+std::vector<DfsLinkText> dfs_link_texts(std::string_view store)
+{
+    std::vector<DfsLinkText> links;
+    for_each_line(store, [&](std::string_view line) {
+        std::array<std::string_view, 4> fields;
+        for (std::size_t i = 0; i < fields.size(); ++i) {
+            const auto tab = line.find('\t');
+            if ((tab == std::string_view::npos) != (i + 1 == fields.size()))
+                return;
+            fields[i] = line.substr(0, tab);
+            line = tab == std::string_view::npos ? std::string_view() : line.substr(tab + 1);
+        }
+        links.push_back({fields[0], fields[1], fields[2], fields[3]});
+    });
+    return links;
+}
 
 std::vector<DfsLink> load_dfs_links()
 {
+    const std::string store = read_text(kDfsLinksPath);
     std::vector<DfsLink> links;
-    for (const std::string& line : read_lines(kDfsLinksPath)) {
-        const auto f = split(line, '\t');
-        if (f.size() == 4)
-            links.push_back({f[0], f[1], f[2], f[3]});
-    }
+    for (const DfsLinkText& link : dfs_link_texts(store))
+        links.push_back({std::string(link.host), std::string(link.path), std::string(link.link), std::string(link.group)});
     return links;
 }
 

@@ -15,6 +15,7 @@
 
 #include <optional>
 #include <string>
+#include <string_view>
 #include <vector>
 
 inline constexpr const char* kDfsLinksPath = "/var/lib/platform/dfs_links";
@@ -28,9 +29,22 @@ struct DfsLink {
     std::string group;
 };
 
+// The same four texts, as parts of the store's text.
+struct DfsLinkText {
+    std::string_view host;
+    std::string_view path;
+    std::string_view link;
+    std::string_view group;
+};
+
 std::vector<DfsLink> load_dfs_links();
+// The links of the store's text (read_text of kDfsLinksPath), without copies of their
+// texts: the list get_dfs_info() fills reads them once.
+std::vector<DfsLinkText> dfs_link_texts(std::string_view store);
 bool save_dfs_links(const std::vector<DfsLink>& links);
 std::vector<std::string> load_dfs_groups();
 bool save_dfs_groups(const std::vector<std::string>& groups);
+// Releases the lists the DFS calls filled, pdfs and pnl (Free_All_List).
+void release_dfs_lists();
 // The folders the host shares, or nothing when the host cannot be reached.
 std::optional<std::vector<std::string>> remote_host_folders(const std::string& host);

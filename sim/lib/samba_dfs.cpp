@@ -1,6 +1,7 @@
 // DFS links and groups of the simulated device, kept in the DFS store (dfs_store.h).
-// The read calls fill the library's lists pdfs and pnl with calloc'd records; a
-// refill frees the previous list first, and Free_All_List frees them too.
+// The read calls fill the library's lists pdfs and pnl, each one block of records
+// (record_block.h); a refill releases the previous list first, and Free_All_List
+// releases them too.
 //
 // Status numbers (none of them is 2, which the program answers for an unknown link):
 //   changes (add/mod/del of links and groups)  0 done, -1 refused: the name is
@@ -15,8 +16,6 @@
 #include "platform/samba.h"
 
 #include <algorithm>
-#include <cstdlib>
-#include <cstring>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -24,6 +23,8 @@
 #include "cgi/file_lock.h"
 #include "dfs_store.h"
 #include "journal.h"
+#include "record_block.h"
+#include "text_file.h"
 
 struct dfs_info* pdfs = nullptr;
 struct name_list* pnl = nullptr;
@@ -31,45 +32,23 @@ struct name_list* pnl = nullptr;
 namespace {
 
 constexpr int kDone = 0;
-// The library's text fields hold at most this many bytes, the terminator included.
-constexpr std::size_t kDfsTextSize = 512;
 constexpr int kRefused = -1;
+
+RecordBlock link_records;
+RecordBlock name_records;
 
 bool storable(std::string_view text)
 {
     return !text.empty() && text.find_first_of("\t\r\n") == std::string_view::npos;
 }
 
-// Copies at most size-1 bytes, as the library's 512-byte fields hold them.
-void copy_field(char* field, std::size_t size, const std::string& text)
-{
-    const std::size_t n = std::min(text.size(), size - 1);
-    std::memcpy(field, text.data(), n);
-    field[n] = '\0';
-}
-
-template <typename Record>
-void free_list(Record*& head)
-{
-    while (head) {
-        Record* next = head->next;
-        std::free(head);
-        head = next;
-    }
-}
-
 void fill_names(const std::vector<std::string>& names)
 {
-    free_list(pnl);
-    name_list** tail = &pnl;
-    for (const std::string& name : names) {
-        auto* record = static_cast<name_list*>(std::calloc(1, sizeof(name_list)));
-        if (!record)
-            return;
-        copy_field(record->name, sizeof record->name, name);
-        *tail = record;
-        tail = &record->next;
-    }
+    pnl = nullptr;
+    const auto records = name_records.hold<name_list>(names.size());
+    for (std::size_t i = 0; i < records.size(); ++i)
+        copy_text_field(records[i].name, names[i]);
+    pnl = records.empty() ? nullptr : records.data();
 }
 
 auto find_link(std::vector<DfsLink>& links, std::string_view link, std::string_view group)
@@ -143,33 +122,18 @@ extern "C" int chk_dfs_node_exist(const char* group, const char* sharename)
 extern "C" int get_dfs_info(void)
 {
     journal_record("get_dfs_info", {});
-    free_list(pdfs);
-    int count = 0;
-    dfs_info** tail = &pdfs;
-    for (const DfsLink& link : load_dfs_links()) {
-        // The record and its four texts are one allocation, the texts after the record:
-        // a list of 400 links is a few pages, not 400 records of the texts' largest size.
-        const auto kept = [](const std::string& text) { return std::min(text.size(), kDfsTextSize - 1); };
-        const std::size_t size = sizeof(dfs_info) + kept(link.host) + kept(link.path) + kept(link.link) + kept(link.group) + 4;
-        auto* record = static_cast<dfs_info*>(std::calloc(1, size));
-        if (!record)
-            break;
-        char* place = reinterpret_cast<char*>(record + 1);
-        const auto hold = [&](const std::string& text) {
-            char* field = place;
-            copy_field(field, kDfsTextSize, text);
-            place += kept(text) + 1;
-            return field;
-        };
-        record->host = hold(link.host);
-        record->share = hold(link.path);
-        record->link = hold(link.link);
-        record->group = hold(link.group);
-        *tail = record;
-        tail = &record->next;
-        ++count;
+    pdfs = nullptr;
+    const std::string store = read_text(kDfsLinksPath);
+    const std::vector<DfsLinkText> links = dfs_link_texts(store);
+    const auto records = link_records.hold<dfs_info>(links.size());
+    for (std::size_t i = 0; i < records.size(); ++i) {
+        copy_text_field(records[i].host, links[i].host);
+        copy_text_field(records[i].share, links[i].path);
+        copy_text_field(records[i].link, links[i].link);
+        copy_text_field(records[i].group, links[i].group);
     }
-    return count;
+    pdfs = records.empty() ? nullptr : records.data();
+    return static_cast<int>(records.size());
 }
 
 extern "C" int add_dfs_group_node(const char* group)
@@ -227,4 +191,12 @@ extern "C" int get_host_share_name(const char* host)
     const auto folders = remote_host_folders(host);
     fill_names(folders ? *folders : std::vector<std::string>{});
     return folders ? 1 : kRefused;
+}
+
+void release_dfs_lists()
+{
+    pdfs = nullptr;
+    link_records.release();
+    pnl = nullptr;
+    name_records.release();
 }

@@ -79,9 +79,10 @@ std::vector<ShareEntry> load_shares()
     return shares;
 }
 
-void for_each_share_location(const std::function<void(std::string_view name, std::string_view path)>& visit)
+void for_each_share_location(std::string_view store,
+                             const std::function<void(std::string_view name, std::string_view path)>& visit)
 {
-    for_each_line(read_text(kShareStorePath), [&](std::string_view line) {
+    for_each_line(store, [&](std::string_view line) {
         // Nine fields, the name not empty: the lines load_shares() takes.
         if (std::count(line.begin(), line.end(), '\t') != 8)
             return;

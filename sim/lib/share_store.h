@@ -39,8 +39,10 @@ bool is_storable_share_path(std::string_view path);
 
 std::vector<ShareEntry> load_shares();
 // The name and path of every share load_shares() gives, in store order, without
-// building whole entries: the share list of every session page reads them.
-void for_each_share_location(const std::function<void(std::string_view name, std::string_view path)>& visit);
+// building whole entries, from the store's text (read_text of kShareStorePath): the
+// share list of every session page reads them.
+void for_each_share_location(std::string_view store,
+                             const std::function<void(std::string_view name, std::string_view path)>& visit);
 bool save_shares(const std::vector<ShareEntry>& shares);
 
 // Creates the share's folder (and its parents) and points /shares/NAME at it; an entry

@@ -46,9 +46,10 @@
 #include <filesystem>
 #include <fstream>
 #include <map>
+#include <set>
 #include <sstream>
 
-#include "accounts_testing.h"
+#include "device.h"
 
 namespace fs = std::filesystem;
 
@@ -78,7 +79,7 @@ std::string unescaped(std::string_view text)
             continue;
         }
         const char next = text[i + 1];
-        if (next == 'x' && i + 3 < text.size() + 0 && std::isxdigit(static_cast<unsigned char>(text[i + 2])) &&
+        if (next == 'x' && i + 3 < text.size() && std::isxdigit(static_cast<unsigned char>(text[i + 2])) &&
             std::isxdigit(static_cast<unsigned char>(text[i + 3]))) {
             out += static_cast<char>(std::stoi(std::string(text.substr(i + 2, 2)), nullptr, 16));
             i += 3;
@@ -163,10 +164,11 @@ void expand(const std::string& call, int number, const std::map<std::string, std
     }
 }
 
-std::vector<Case> load(const fs::path& path)
+// Adds the cases of one file.
+void load(const fs::path& path, std::vector<Case>& cases)
 {
     std::ifstream in(path);
-    std::vector<Case> cases;
+    const std::size_t first = cases.size();
     std::map<std::string, std::string> names;
     std::map<std::string, std::vector<std::string>> blocks;
     std::string text, open_block;
@@ -194,7 +196,7 @@ std::vector<Case> load(const fs::path& path)
             blocks[rest].clear();
         } else if (head == "case") {
             cases.push_back({path.stem().string(), rest, {}});
-        } else if (cases.empty()) {
+        } else if (cases.size() == first) {
             throw std::runtime_error(path.string() + ":" + std::to_string(number) + ": a line before the first case");
         } else if (head[0] == '@') {
             expand(text, number, blocks, names, cases.back().lines);
@@ -202,22 +204,13 @@ std::vector<Case> load(const fs::path& path)
             cases.back().lines.push_back({number, text});
         }
     }
-    return cases;
 }
 
 std::vector<Case> all_cases()
 {
-    std::vector<fs::path> files;
-    for (const auto& entry : fs::directory_iterator(std::string(NAS_SOURCE_DIR) + "/tests/device/cases")) {
-        if (entry.path().extension() == ".cases")
-            files.push_back(entry.path());
-    }
-    std::sort(files.begin(), files.end());
     std::vector<Case> cases;
-    for (const fs::path& file : files) {
-        auto found = load(file);
-        cases.insert(cases.end(), found.begin(), found.end());
-    }
+    for (const fs::path& file : std::set<fs::path>(fs::directory_iterator(NAS_SOURCE_DIR "/tests/device/cases"), fs::directory_iterator()))
+        load(file, cases);
     return cases;
 }
 
@@ -232,18 +225,6 @@ Fields form_fields(const std::vector<std::string>& items)
         fields.emplace_back(item.substr(0, eq), value);
     }
     return fields;
-}
-
-std::string shown(const Journal& journal)
-{
-    std::string text;
-    for (const Event& event : journal) {
-        text += " ";
-        for (const std::string& word : event)
-            text += " [" + word + "]";
-        text += "\n";
-    }
-    return text;
 }
 
 // The events of a "-" line: one per item of its word's {A,B,...}, or just the one.
@@ -269,8 +250,7 @@ struct Pending {
     int line = 0;
     std::optional<std::string> answer;     // nullopt: not given
     bool answer_any = false, journal_any = false, log_any = false;
-    std::string got, err;
-    int status = -1;
+    Reply reply;
     Journal journal;
     std::vector<std::string> drop;
     std::vector<std::string> log;
@@ -295,14 +275,13 @@ public:
 private:
     static bool is_request(const std::string& text)
     {
-        const std::string head = split_first(text).first;
-        return head == "get" || head == "post" || head == "raw" || head == "body" || head == "run";
+        static const std::set<std::string> heads = {"get", "post", "raw", "body", "run"};
+        return heads.count(split_first(text).first) > 0;
     }
     static bool is_setup(const std::string& text)
     {
-        const std::string head = split_first(text).first;
-        return head == "file" || head == "append" || head == "rm" || head == "config" || head == "volumes" ||
-               head == "trace" || head == "program" || head == "link";
+        static const std::set<std::string> heads = {"file", "append", "rm", "config", "volumes", "trace", "program", "link"};
+        return heads.count(split_first(text).first) > 0;
     }
 
     // The files that the request at `at` must leave as they are, read before it runs.
@@ -335,14 +314,11 @@ private:
                 m_dev.install_probe(argv[0]);
                 argv[0] = "/sbin/" + argv[0];
             }
-            const Reply reply = head == "run"    ? m_dev.run(argv)
-                                : head == "get"  ? m_dev.get_raw(query)
-                                : head == "post" ? m_dev.post_raw(query, "application/x-www-form-urlencoded")
-                                : head == "raw"  ? m_dev.get_raw(arg)
-                                                 : m_dev.post_raw(unescaped(rest.substr(rest.find(' ', rest[0] == '"' ? rest.find('"', 1) : 0) + 1)), items.at(0));
-            m_pending->got = reply.out;
-            m_pending->status = reply.status;
-            m_pending->err = reply.err;
+            m_pending->reply = head == "run"    ? m_dev.run(argv)
+                                : head == "get"  ? m_dev.get(query)
+                                : head == "post" ? m_dev.post(query)
+                                : head == "raw"  ? m_dev.get(arg)
+                                                 : m_dev.post(unescaped(rest.substr(rest.find(' ', rest[0] == '"' ? rest.find('"', 1) : 0) + 1)), items.at(0));
         } else if (is_setup(text)) {
             settle();
             setup(head, rest);
@@ -362,18 +338,15 @@ private:
             m_dev.remove(first);
             m_dev.write_file(first, unescaped(second));
             if (head == "program")
-                fs::permissions(m_dev.host_path(first), fs::perms(0755));
+                fs::permissions(m_dev.root() + first, fs::perms(0755));
         } else if (head == "rm") {
             m_dev.remove(rest);
         } else if (head == "config") {
-            if (second.empty() && rest.find(' ') == std::string::npos)
-                m_dev.remove_config(first);
-            else
-                m_dev.config({{first, unescaped(second)}});
+            m_dev.config(first, rest.find(' ') == std::string::npos ? std::nullopt : std::optional(unescaped(second)));
         } else if (head == "link") {
             m_dev.symlink(second, first);
         } else if (head == "trace") {
-            m_dev.trace_on();
+            m_dev.write_file("/tmp/cgi_debug", "");
         } else {
             // Disks of 1877538, 937795, 4096 and 2048 megabytes for HD_a2 to HD_d2.
             static const std::map<std::string, std::string> tables = {
@@ -396,7 +369,7 @@ private:
         if (head == "xml")
             p.answer = xml_answer(arg);
         else if (head == "utf8")
-            p.answer = xml_utf8_answer(arg);
+            p.answer = xml_answer(arg, true);
         else if (head == "html")
             p.answer = kEmptyHtml;
         else if (head == "answer" && rest == "any")
@@ -446,11 +419,11 @@ private:
             return;
         const Pending& p = *m_pending;
         const std::string where = m_case.file + ".cases:" + std::to_string(p.line);
-        EXPECT_EQ(p.status, 0) << where << ": the program ended badly:\n" << p.err;
+        EXPECT_EQ(p.reply.status, 0) << where << ": the program ended badly:\n" << p.reply.err;
         if (p.answer)
-            EXPECT_EQ(p.got, *p.answer) << where;
+            EXPECT_EQ(p.reply.out, *p.answer) << where;
         else if (!p.answer_any)
-            ADD_FAILURE() << where << ": the request has no expected answer; it answered:\n" << p.got;
+            ADD_FAILURE() << where << ": the request has no expected answer; it answered:\n" << p.reply.out;
         if (!p.journal_any) {
             const Journal got = m_dev.journal();
             Journal kept;
@@ -458,12 +431,12 @@ private:
                 if (std::find(p.drop.begin(), p.drop.end(), event.at(0)) == p.drop.end())
                     kept.push_back(event);
             }
-            EXPECT_EQ(kept, p.journal) << where << ": the journal was\n" << shown(kept) << "expected\n" << shown(p.journal);
+            EXPECT_EQ(kept, p.journal) << where;
         }
         if (!p.log_any) {
-            EXPECT_EQ(m_dev.messages(), p.log) << where;
+            EXPECT_EQ(m_dev.lines("/var/log/messages"), p.log) << where;
         }
-        EXPECT_EQ(m_dev.console(), p.console) << where;
+        EXPECT_EQ(m_dev.read_file("/var/log/console"), p.console) << where;
         m_pending.reset();
     }
 

@@ -1,7 +1,7 @@
 #include "device.h"
 
+#include <algorithm>
 #include <cctype>
-#include <cstdio>
 #include <cstdlib>
 #include <fcntl.h>
 #include <filesystem>
@@ -19,9 +19,9 @@ namespace fs = std::filesystem;
 
 namespace {
 
-const std::string kRepo = NAS_SOURCE_DIR;
+const std::string kDevroot = NAS_SOURCE_DIR "/scripts/devroot";
 const std::string kBuild = NAS_BUILD_DIR;
-const std::string kProgram = "/var/www/cgi-bin/nas-accounts.cgi";
+const std::string kProgram = "/var/www/cgi-bin/nas-accounts.cgi", kConfig = "/etc/NAS_CFG/config.xml";
 
 std::string slurp(const std::string& path)
 {
@@ -70,11 +70,6 @@ Reply spawn(const std::vector<std::string>& argv, const std::vector<std::string>
     fs::remove(out_path);
     fs::remove(err_path);
     return reply;
-}
-
-std::string devroot()
-{
-    return kRepo + "/scripts/devroot";
 }
 
 std::vector<std::string> base_environment()
@@ -140,7 +135,7 @@ Device::Device()
     m_root = pattern;
     m_scratch = m_root + ".io";
     fs::create_directories(m_scratch);
-    const Reply created = spawn({devroot(), "create", m_root}, base_environment(), "", m_scratch);
+    const Reply created = spawn({kDevroot, "create", m_root}, base_environment(), "", m_scratch);
     if (created.status != 0)
         throw std::runtime_error("devroot create failed: " + created.err);
 }
@@ -154,64 +149,60 @@ Device::~Device()
     }
 }
 
-std::string Device::host_path(std::string_view device_path) const
-{
-    return m_root + std::string(device_path);
-}
-
 void Device::write_file(std::string_view device_path, std::string_view content)
 {
-    const fs::path path = host_path(device_path);
+    const fs::path path = m_root + std::string(device_path);
     fs::create_directories(path.parent_path());
     std::ofstream(path, std::ios::binary | std::ios::trunc) << content;
 }
 
 std::string Device::read_file(std::string_view device_path) const
 {
-    return slurp(host_path(device_path));
+    return slurp(m_root + std::string(device_path));
+}
+
+std::vector<std::string> Device::lines(std::string_view device_path) const
+{
+    std::vector<std::string> found;
+    std::istringstream in(read_file(device_path));
+    for (std::string line; std::getline(in, line);)
+        found.push_back(line);
+    return found;
 }
 
 bool Device::exists(std::string_view device_path) const
 {
     std::error_code ignored;
-    return fs::exists(fs::symlink_status(host_path(device_path), ignored));
+    return fs::exists(fs::symlink_status(m_root + std::string(device_path), ignored));
 }
 
 void Device::remove(std::string_view device_path)
 {
     std::error_code ignored;
-    fs::remove_all(host_path(device_path), ignored);
+    fs::remove_all(m_root + std::string(device_path), ignored);
 }
 
 void Device::symlink(std::string_view target, std::string_view device_path)
 {
     remove(device_path);
-    fs::create_symlink(std::string(target), host_path(device_path));
+    fs::create_symlink(std::string(target), m_root + std::string(device_path));
 }
 
-void Device::config(std::initializer_list<std::pair<std::string, std::string>> keys)
+void Device::config(std::string_view key, const std::optional<std::string>& value)
 {
-    const std::string file = host_path("/etc/NAS_CFG/config.xml");
+    const std::string file = m_root + kConfig;
     pugi::xml_document doc;
     doc.load_file(file.c_str());
-    for (const auto& [key, value] : keys)
-        config_key(doc, key, true).text().set(value.c_str());
-    doc.save_file(file.c_str(), "\t");
-}
-
-void Device::remove_config(std::string_view key)
-{
-    const std::string file = host_path("/etc/NAS_CFG/config.xml");
-    pugi::xml_document doc;
-    doc.load_file(file.c_str());
-    if (pugi::xml_node node = config_key(doc, key, false))
+    if (value)
+        config_key(doc, key, true).text().set(value->c_str());
+    else if (pugi::xml_node node = config_key(doc, key, false))
         node.parent().remove_child(node);
     doc.save_file(file.c_str(), "\t");
 }
 
 std::string Device::config_value(std::string_view key) const
 {
-    const std::string file = host_path("/etc/NAS_CFG/config.xml");
+    const std::string file = m_root + kConfig;
     pugi::xml_document doc;
     doc.load_file(file.c_str());
     const pugi::xml_node node = config_key(doc, key, false);
@@ -220,30 +211,20 @@ std::string Device::config_value(std::string_view key) const
 
 void Device::install_probe(std::string_view name)
 {
-    const std::string target = host_path("/sbin/" + std::string(name));
-    fs::copy_file(kBuild + "/" + std::string(name), target, fs::copy_options::overwrite_existing);
+    fs::copy_file(kBuild + "/" + std::string(name), m_root + "/sbin/" + std::string(name),
+                  fs::copy_options::overwrite_existing);
 }
 
-void Device::trace_on()
-{
-    write_file("/tmp/cgi_debug", "");
-}
-
-std::string Device::request(std::string_view cmd, const Fields& fields)
-{
-    return get_raw(query_string(cmd, fields)).out;
-}
-
-Reply Device::get_raw(std::string_view query)
+Reply Device::get(std::string_view query)
 {
     return run({kProgram}, {{"REQUEST_METHOD", "GET"}, {"QUERY_STRING", std::string(query)}});
 }
 
-Reply Device::post_raw(std::string_view body, std::string_view content_type, std::string_view query)
+Reply Device::post(std::string_view body, std::string_view content_type)
 {
     return run({kProgram},
                {{"REQUEST_METHOD", "POST"},
-                {"QUERY_STRING", std::string(query)},
+                {"QUERY_STRING", ""},
                 {"CONTENT_TYPE", std::string(content_type)},
                 {"CONTENT_LENGTH", std::to_string(body.size())}},
                body);
@@ -251,7 +232,7 @@ Reply Device::post_raw(std::string_view body, std::string_view content_type, std
 
 Reply Device::run(const std::vector<std::string>& argv, const Fields& environment, std::string_view input)
 {
-    std::vector<std::string> command{devroot(), "run", m_root, "--"};
+    std::vector<std::string> command{kDevroot, "run", m_root, "--"};
     command.insert(command.end(), argv.begin(), argv.end());
     std::vector<std::string> env = base_environment();
     env.push_back("GATEWAY_INTERFACE=CGI/1.1");
@@ -264,33 +245,15 @@ Reply Device::run(const std::vector<std::string>& argv, const Fields& environmen
 Journal Device::journal() const
 {
     Journal events;
-    std::istringstream lines(read_file("/var/log/platform.log"));
-    std::string line;
-    while (std::getline(lines, line))
+    for (const std::string& line : lines("/var/log/platform.log"))
         events.push_back(split_event(line));
     return events;
 }
 
-std::vector<std::string> Device::messages() const
-{
-    std::vector<std::string> result;
-    std::istringstream lines(read_file("/var/log/messages"));
-    std::string line;
-    while (std::getline(lines, line))
-        result.push_back(line);
-    return result;
-}
-
-std::string Device::console() const
-{
-    return read_file("/var/log/console");
-}
-
 void Device::clear_records()
 {
-    write_file("/var/log/platform.log", "");
-    write_file("/var/log/messages", "");
-    write_file("/var/log/console", "");
+    for (const char* log : {"/var/log/platform.log", "/var/log/messages", "/var/log/console"})
+        write_file(log, "");
 }
 
 std::string query_string(std::string_view cmd, const Fields& fields)
@@ -317,24 +280,55 @@ std::string url_encode(std::string_view value)
     return encoded;
 }
 
-std::string xml_answer(std::string_view body)
+std::string xml_answer(std::string_view body, bool utf8)
 {
-    return "Pragma: no-cache\r\nCache-Control: no-cache\r\nContent-Type: text/xml\r\n\r\n"
-           "<?xml version=\"1.0\" encoding=\"UTF-8\"?>" + std::string(body);
+    return std::string("Pragma: no-cache\r\nCache-Control: no-cache\r\nContent-Type: text/xml") +
+           (utf8 ? "; charset=utf-8" : "") + "\r\n\r\n<?xml version=\"1.0\" encoding=\"UTF-8\"?>" + std::string(body);
 }
 
-std::string xml_utf8_answer(std::string_view body)
+Journal ran(const std::string& line)
 {
-    return "Pragma: no-cache\r\nCache-Control: no-cache\r\nContent-Type: text/xml; charset=utf-8\r\n\r\n"
-           "<?xml version=\"1.0\" encoding=\"UTF-8\"?>" + std::string(body);
-}
-
-std::vector<std::string> shell_lines(const Journal& journal)
-{
-    std::vector<std::string> lines;
-    for (const Event& event : journal) {
-        if (event.size() == 3 && event[0] == "sh" && event[1] == "-c")
-            lines.push_back(event[2]);
+    Event argv{""};
+    bool quoted = false;    // the word so far had quotes, so it counts even when empty
+    for (std::size_t i = 0; i < line.size() && line[i] != '>'; ++i) {
+        if (line[i] == '\'' || line[i] == '"') {
+            const std::size_t end = line.find(line[i], i + 1);
+            argv.back() += line.substr(i + 1, end - i - 1);
+            quoted = true;
+            i = end;
+        } else if (line[i] != ' ') {
+            argv.back() += line[i] == '\\' ? line[++i] : line[i];
+        } else {
+            if (!argv.back().empty() || quoted)
+                argv.push_back("");
+            quoted = false;
+        }
     }
-    return lines;
+    if (argv.back().empty() && !quoted)
+        argv.pop_back();
+    return {{"sh", "-c", line}, argv};
+}
+
+std::string base64(std::string_view text)
+{
+    constexpr std::string_view kAlphabet = "ABCDEFGHIJKLMNOPQRSTUVWXYZabcdefghijklmnopqrstuvwxyz0123456789+/";
+    std::string encoded;
+    for (std::size_t i = 0; i < text.size(); i += 3) {
+        const std::size_t n = std::min<std::size_t>(3, text.size() - i);
+        unsigned value = 0;
+        for (std::size_t j = 0; j < 3; ++j)
+            value = value << 8 | (j < n ? static_cast<unsigned char>(text[i + j]) : 0u);
+        for (std::size_t j = 0; j < 4; ++j)
+            encoded += j <= n ? kAlphabet[(value >> (18 - 6 * j)) & 63] : '=';
+    }
+    return encoded;
+}
+
+std::string account_line(const Device& dev, std::string_view file, std::string_view name)
+{
+    for (const std::string& line : dev.lines(file)) {
+        if (line.starts_with(std::string(name) + ":"))
+            return line;
+    }
+    return "(none)";
 }

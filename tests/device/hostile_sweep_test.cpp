@@ -11,7 +11,7 @@
 #include <map>
 #include <sstream>
 
-#include "accounts_testing.h"
+#include "device.h"
 
 namespace fs = std::filesystem;
 
@@ -129,7 +129,7 @@ TEST_P(HostileSweep, NoPayloadRunsACommandOrTouchesAFileOutsideTheCommandsOwn)
     Device dev;
     dev.write_file("/tmp/import_users", "imp1\tpw\n");
     dev.write_file("/tmp/import_groups", "impg\talice\n");
-    dev.request("cgi_set_dfs_group", {{"group", "Sales"}, {"flag", "1"}});
+    dev.get(query_string("cgi_set_dfs_group", {{"group", "Sales"}, {"flag", "1"}}));
     Places allowed = {"/var/log", "/tmp", "/var/lock"};
     allowed.insert(allowed.end(), row.allowed.begin(), row.allowed.end());
     const auto outside = [&](const std::string& path) {
@@ -148,10 +148,7 @@ TEST_P(HostileSweep, NoPayloadRunsACommandOrTouchesAFileOutsideTheCommandsOwn)
                 std::erase_if(fields, [&](const auto& field) { return field.first == name; });
                 fields.emplace_back(name, encoded ? base64(payload) : payload);
             }
-            std::string body = "cmd=" + std::string(row.cmd);
-            for (const auto& [name, value] : fields)
-                body += "&" + name + "=" + url_encode(value);
-            const Reply reply = dev.post_raw(body, "application/x-www-form-urlencoded");
+            const Reply reply = dev.post(query_string(row.cmd, fields));
             const auto after = snapshot(dev);
             const std::string where = std::string(row.cmd) + " field " + item + " payload " + testing::PrintToString(payload);
             EXPECT_EQ(reply.status, 0) << where;

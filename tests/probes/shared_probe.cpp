@@ -1,7 +1,6 @@
 // Runs one shared helper of the program inside a device and prints its result:
 //   shared_probe resolve SOURCE MODE | sizes | count | users | groups
-//   shared_probe metachars TEXT | base64 TEXT SIZE | element TAG VALUE
-//   shared_probe trace LENGTH | event NAME | shell TEXT
+//   shared_probe base64 TEXT SIZE | element TAG VALUE | trace LENGTH | event NAME
 #include <cstdio>
 #include <cstdlib>
 #include <string>
@@ -9,7 +8,6 @@
 
 #include "cgi/event_log.h"
 #include "cgi/fixed_text.h"
-#include "cgi/shell.h"
 #include "cgi/trace.h"
 #include "platform/cgic.h"
 #include "volumes/helpers.h"
@@ -35,8 +33,6 @@ int main(int argc, char** argv)
         std::printf("%d", count_listed_users());
     } else if (what == "groups") {
         std::printf("%d", count_listed_groups());
-    } else if (what == "metachars" && argc == 3) {
-        std::printf("|%d", has_shell_metachars(argv[2]));
     } else if (what == "base64" && argc == 4) {
         FixedText<16> decoded;
         decode_base64_field(reinterpret_cast<unsigned char*>(decoded.data()), argv[2],
@@ -50,9 +46,6 @@ int main(int argc, char** argv)
     } else if (what == "event" && argc == 3) {
         log_event("Account \"%s\" has been created.", argv[2]);
         log_event("Admin password has been modified.");
-    } else if (what == "shell" && argc == 3) {
-        run_shell_command("account -m -u %s", cgi_escapeshellarg(argv[2]));
-        cgi_escapeshellarg_free();
     } else {
         return 2;
     }
