@@ -1,9 +1,7 @@
 // The response stream and what the program writes to it through the library.
 #include "platform/cgic.h"
 
-#include <algorithm>
 #include <cstdio>
-#include <string_view>
 
 FILE* cgiOut = stdout;
 
@@ -17,23 +15,26 @@ extern "C" cgiFormResultType cgiHtmlEscape(const char* text)
 {
     if (text == nullptr)
         return cgiFormSuccess;
-    std::string_view rest(text);
+    const char* rest = text;
     bool ok = true;
-    while (!rest.empty()) {
+    while (true) {
         // Runs of ordinary characters go out in one write.
-        const std::size_t special = std::min(rest.find_first_of("&<>\""), rest.size());
-        ok = std::fwrite(rest.data(), 1, special, cgiOut) == special && ok;
-        if (special == rest.size())
+        const char* special = rest;
+        while (*special != '\0' && *special != '&' && *special != '<' && *special != '>' && *special != '"')
+            ++special;
+        const auto run = static_cast<std::size_t>(special - rest);
+        ok = std::fwrite(rest, 1, run, cgiOut) == run && ok;
+        if (*special == '\0')
             break;
         const char* entity = "&quot;";
-        switch (rest[special]) {
+        switch (*special) {
         case '&': entity = "&amp;"; break;
         case '<': entity = "&lt;"; break;
         case '>': entity = "&gt;"; break;
         default: break;
         }
         ok = std::fputs(entity, cgiOut) >= 0 && ok;
-        rest.remove_prefix(special + 1);
+        rest = special + 1;
     }
     return ok ? cgiFormSuccess : cgiFormIO;
 }

@@ -13,7 +13,6 @@
 #include <cstdlib>
 #include <cstring>
 #include <pugixml.hpp>
-#include <sstream>
 #include <string>
 #include <string_view>
 #include <utility>
@@ -45,6 +44,13 @@ pugi::xml_document& document()
     }
     return doc;
 }
+
+// Collects a saved document's text.
+class TextWriter final : public pugi::xml_writer {
+public:
+    void write(const void* data, std::size_t size) override { text.append(static_cast<const char*>(data), size); }
+    std::string text;
+};
 
 // The keys this process set since its last save, with their values, in order.
 std::vector<std::pair<std::string, std::string>>& changes()
@@ -135,9 +141,9 @@ extern "C" int xml_write_file(const char* file)
     load(current, file);
     for (const auto& [path, value] : changes())
         find_or_create_key(current, path.c_str()).text().set(value.c_str());
-    std::ostringstream text;
-    current.save(text, "\t");
-    if (!replace_file(file, text.str()))
+    TextWriter saved;
+    current.save(saved, "\t");
+    if (!replace_file(file, saved.text))
         return -1;
     document().reset(current);
     changes().clear();
