@@ -24,26 +24,32 @@ for deb in $("$repo/scripts/make-deb" amd64 "$build" "$scratch"); do
 done
 
 port=$(python3 -c 'import socket; s = socket.socket(); s.bind(("127.0.0.1", 0)); print(s.getsockname()[1])')
+# As Debian's lighttpd serves it: the cgi module's alias, and the package's own snippet.
+sed "s|/usr/share/|$root/usr/share/|" "$root/etc/lighttpd/conf-available/50-nas-accounts.conf" > "$scratch/nas-accounts.conf"
+mkdir "$scratch/html"
 cat > "$scratch/lighttpd.conf" <<CONF
 server.modules = ("mod_alias", "mod_cgi", "mod_setenv")
-server.document-root = "$root/var/www/web"
+server.document-root = "$scratch/html"
 server.bind = "127.0.0.1"
 server.port = $port
 server.errorlog = "$scratch/error.log"
 index-file.names = ("index.html")
 mimetype.assign = (".html" => "text/html")
-alias.url = ("/cgi-bin/" => "$root/var/www/cgi-bin/")
-\$HTTP["url"] =~ "^/cgi-bin/" { cgi.assign = (".cgi" => "") }
+\$HTTP["url"] =~ "^/cgi-bin/" {
+  cgi.assign = ("" => "")
+  alias.url += ("/cgi-bin/" => "$root/usr/lib/cgi-bin/")
+}
+include "$scratch/nas-accounts.conf"
 setenv.add-environment = ("LD_LIBRARY_PATH" => "$root/usr/lib/x86_64-linux-gnu")
 CONF
 lighttpd -D -f "$scratch/lighttpd.conf" &
 server=$!
 for _ in $(seq 100); do
-  curl -s -o /dev/null "http://127.0.0.1:$port/" && break
+  curl -s -o /dev/null "http://127.0.0.1:$port/nas-accounts/" && break
   sleep 0.1
 done
 
-page=$(curl -sf "http://127.0.0.1:$port/")
+page=$(curl -sf "http://127.0.0.1:$port/nas-accounts/")
 grep -q "<html" <<<"$page" || { echo "no console page: $page" >&2; exit 1; }
 answer=$(curl -sf "http://127.0.0.1:$port/cgi-bin/nas-accounts.cgi?cmd=cgi_get_service_info")
 grep -q "<cloud_access>0</cloud_access>" <<<"$answer" || { echo "no answer: $answer" >&2; cat "$scratch/error.log" >&2; exit 1; }
