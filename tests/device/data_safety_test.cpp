@@ -60,16 +60,18 @@ void make_ten_shares(Device& dev)
 
 } // namespace
 
-// 20 users (each then given a quota) and three config keys switched four times, all at
+// 12 users (each then given a quota) and three config keys switched four times, all at
 // once, then 10 NFS rules at once: a lost change shows as a missing line or the previous
-// value. The rules go on their own: with 30 other requests beside them, the last of them
-// could wait past the bounded wait for the exports lock and give up (as designed).
+// value (without the locks, most of them were lost). The number of writers at once stays
+// where the last of them is served well inside the bounded lock wait even on a
+// sanitizer build of a loaded machine: with 20 users, or with the rules beside them,
+// one of them now and then waited past it and gave up (as designed, with the event).
 TEST(DataSafety, ManyRequestsAtOnceKeepEveryChange)
 {
     Device dev;
     make_ten_shares(dev);
     std::vector<std::string> jobs, nfs_jobs, system_rules, volume_rules;
-    for (int i = 0; i < 20; ++i) {
+    for (int i = 0; i < 12; ++i) {
         const std::string n = std::to_string(i), name = "par" + n;
         jobs.push_back(request_line("cgi_user_add", {{"name", name}, {"pw", "c2VjcmV0"}, {"pw_onoff", "1"},
                                                      {"group", "family"}}, "/tmp/add" + n) + ";" +
@@ -94,16 +96,16 @@ TEST(DataSafety, ManyRequestsAtOnceKeepEveryChange)
     const auto passwd = dev.lines("/etc/passwd"), shares = dev.lines("/var/lib/platform/shares");
     const auto quota = dev.lines("/var/lib/platform/quota"), exports = dev.lines("/etc/exports");
     long users = 0, home_shares = 0, limits = 0;
-    for (int i = 0; i < 20; ++i) {
+    for (int i = 0; i < 12; ++i) {
         const std::string name = "par" + std::to_string(i);
         users += count_starting(passwd, name + ":x:");
         home_shares += count_starting(shares, name + "\t/mnt/HD/HD_a2/" + name + "\t");
         limits += count_starting(quota, "u\tHD_a2\t" + name + "\t102400");
         EXPECT_EQ(dev.read_file("/tmp/add" + std::to_string(i)), xml_answer("<adduser><status>ok</status></adduser>"));
     }
-    EXPECT_EQ(users, 20);
-    EXPECT_EQ(home_shares, 20);
-    EXPECT_EQ(limits, 20);
+    EXPECT_EQ(users, 12);
+    EXPECT_EQ(home_shares, 12);
+    EXPECT_EQ(limits, 12);
     // The files hold nothing else but what was there and the new entries.
     EXPECT_EQ(passwd.size(), dev.lines("/etc/shadow").size());
     EXPECT_THAT(dev.lines("/etc/group"), Contains(StartsWith("family:x:1004:alice,bob,par")));
