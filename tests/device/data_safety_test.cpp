@@ -104,6 +104,9 @@ TEST(DataSafety, ManyRequestsAtOnceKeepEveryChange)
         users += count_starting(passwd, name + ":x:");
         home_shares += count_starting(shares, name + "\t/mnt/HD/HD_a2/" + name + "\t");
         limits += count_starting(quota, "u\tHD_a2\t" + name + "\t102400");
+        if (gave_up == 0) {
+            EXPECT_EQ(dev.read_file("/tmp/add" + std::to_string(i)), xml_answer("<adduser><status>ok</status></adduser>"));
+        }
     }
     EXPECT_GE(users, 12 - gave_up);
     EXPECT_GE(home_shares, 12 - gave_up);
