@@ -17,12 +17,6 @@ extern char** environ;
 
 namespace fs = std::filesystem;
 
-namespace {
-
-const std::string kDevroot = NAS_SOURCE_DIR "/scripts/devroot";
-const std::string kBuild = NAS_BUILD_DIR;
-const std::string kProgram = "/var/www/cgi-bin/nas-accounts.cgi", kConfig = "/etc/NAS_CFG/config.xml";
-
 std::string slurp(const std::string& path)
 {
     std::ifstream in(path, std::ios::binary);
@@ -30,6 +24,12 @@ std::string slurp(const std::string& path)
     content << in.rdbuf();
     return content.str();
 }
+
+namespace {
+
+const std::string kDevroot = NAS_SOURCE_DIR "/scripts/devroot";
+const std::string kBuild = NAS_BUILD_DIR;
+const std::string kProgram = "/var/www/cgi-bin/nas-accounts.cgi", kConfig = "/etc/NAS_CFG/config.xml";
 
 // Runs argv on the host with the given environment; standard input from a file,
 // standard output and error into files (no pipe can fill up and block).
@@ -66,9 +66,6 @@ Reply spawn(const std::vector<std::string>& argv, const std::vector<std::string>
     reply.out = slurp(out_path);
     reply.err = slurp(err_path);
     reply.status = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
-    fs::remove(in_path);
-    fs::remove(out_path);
-    fs::remove(err_path);
     return reply;
 }
 
