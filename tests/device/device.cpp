@@ -3,25 +3,15 @@
 #include <algorithm>
 #include <cctype>
 #include <cstdlib>
-#include <fcntl.h>
 #include <filesystem>
 #include <fstream>
 #include <pugixml.hpp>
-#include <spawn.h>
+#include <regex>
 #include <sstream>
 #include <stdexcept>
 #include <sys/wait.h>
-#include <unistd.h>
-
-extern char** environ;
 
 namespace fs = std::filesystem;
-
-namespace {
-
-const std::string kDevroot = NAS_SOURCE_DIR "/scripts/devroot";
-const std::string kBuild = NAS_BUILD_DIR;
-const std::string kProgram = "/var/www/cgi-bin/nas-accounts.cgi", kConfig = "/etc/NAS_CFG/config.xml";
 
 std::string slurp(const std::string& path)
 {
@@ -31,45 +21,25 @@ std::string slurp(const std::string& path)
     return content.str();
 }
 
-// Runs argv on the host with the given environment; standard input from a file,
+namespace {
+
+const std::string kDevroot = NAS_SOURCE_DIR "/scripts/devroot";
+const std::string kBuild = NAS_BUILD_DIR;
+const std::string kProgram = "/var/www/cgi-bin/nas-accounts.cgi", kConfig = "/etc/NAS_CFG/config.xml";
+
+// Runs argv on the host with only the given environment; standard input from a file,
 // standard output and error into files (no pipe can fill up and block).
 Reply spawn(const std::vector<std::string>& argv, const std::vector<std::string>& environment,
             std::string_view input, const std::string& scratch)
 {
-    const std::string in_path = scratch + "/stdin", out_path = scratch + "/stdout", err_path = scratch + "/stderr";
-    std::ofstream(in_path, std::ios::binary) << input;
-
-    posix_spawn_file_actions_t actions;
-    posix_spawn_file_actions_init(&actions);
-    posix_spawn_file_actions_addopen(&actions, 0, in_path.c_str(), O_RDONLY, 0);
-    posix_spawn_file_actions_addopen(&actions, 1, out_path.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
-    posix_spawn_file_actions_addopen(&actions, 2, err_path.c_str(), O_WRONLY | O_CREAT | O_TRUNC, 0644);
-
-    std::vector<char*> args;
-    for (const std::string& arg : argv)
-        args.push_back(const_cast<char*>(arg.c_str()));
-    args.push_back(nullptr);
-    std::vector<char*> env;
-    for (const std::string& entry : environment)
-        env.push_back(const_cast<char*>(entry.c_str()));
-    env.push_back(nullptr);
-
-    pid_t pid = 0;
-    const int failed = posix_spawnp(&pid, args[0], &actions, nullptr, args.data(), env.data());
-    posix_spawn_file_actions_destroy(&actions);
-    if (failed)
-        throw std::runtime_error("cannot start " + argv[0]);
-    int status = 0;
-    waitpid(pid, &status, 0);
-
-    Reply reply;
-    reply.out = slurp(out_path);
-    reply.err = slurp(err_path);
-    reply.status = WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status);
-    fs::remove(in_path);
-    fs::remove(out_path);
-    fs::remove(err_path);
-    return reply;
+    std::ofstream(scratch + "/stdin", std::ios::binary) << input;
+    std::string line = "exec env -i";
+    for (const std::vector<std::string>* words : {&environment, &argv}) {
+        for (const std::string& word : *words)
+            line += " '" + std::regex_replace(word, std::regex("'"), "'\\''") + "'";
+    }
+    const int status = std::system((line + " <" + scratch + "/stdin >" + scratch + "/stdout 2>" + scratch + "/stderr").c_str());
+    return {slurp(scratch + "/stdout"), slurp(scratch + "/stderr"), WIFEXITED(status) ? WEXITSTATUS(status) : 128 + WTERMSIG(status)};
 }
 
 std::vector<std::string> base_environment()

@@ -79,6 +79,8 @@ inline const std::string kEmptyHtml = "Content-Type: text/html\r\n\r\n";
 // A foreground command line and the tool event the shell makes of it: words split at
 // blanks, quotes removed ('\'' is a quote inside a word), redirections from ">" on dropped.
 Journal ran(const std::string& line);
+// A host file's whole content ("" when there is none).
+std::string slurp(const std::string& path);
 // Base64 as the pages send passwords.
 std::string base64(std::string_view text);
 // The line of a colon file (passwd, group, shadow) for `name`, or "(none)".
