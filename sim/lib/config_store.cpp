@@ -9,9 +9,11 @@
 // stored meanwhile is kept, and readers see the old or the new file, never a part.
 #include "platform/config_store.h"
 
+#include <array>
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
+#include <functional>
 #include <pugixml.hpp>
 #include <string>
 #include <string_view>
@@ -26,9 +28,34 @@ namespace {
 
 constexpr const char* kConfigFile = "/etc/NAS_CFG/config.xml";
 
+// pugixml's memory comes from one block of the process first: a request's store is a
+// few KiB, and a heap page of 32 KiB for it would touch more memory than it uses.
+alignas(16) std::array<unsigned char, 64 * 1024> arena;
+std::size_t arena_used = 0;
+
+void* arena_allocate(std::size_t size)
+{
+    const std::size_t rounded = (size + 15) & ~std::size_t{15};
+    if (rounded > arena.size() - arena_used)
+        return std::malloc(size);
+    void* block = arena.data() + arena_used;
+    arena_used += rounded;
+    return block;
+}
+
+void arena_deallocate(void* block)
+{
+    const auto* byte = static_cast<const unsigned char*>(block);
+    const std::less<const unsigned char*> before;
+    if (before(byte, arena.data()) || !before(byte, arena.data() + arena.size()))
+        std::free(block);
+}
+
 void load(pugi::xml_document& doc, const char* file)
 {
-    if (!doc.load_file(file))
+    pugi::set_memory_management_functions(arena_allocate, arena_deallocate);
+    std::string text;
+    if (!read_whole_file(file, text) || !doc.load_buffer(text.data(), text.size()))
         doc.reset();
     if (!doc.document_element())
         doc.append_child("config");

@@ -2,11 +2,10 @@
 
 #include <algorithm>
 #include <cstdlib>
-#include <filesystem>
+#include <sys/stat.h>
+#include <unistd.h>
 
 #include "text_file.h"
-
-namespace fs = std::filesystem;
 
 namespace {
 
@@ -59,11 +58,9 @@ bool is_storable_share_path(std::string_view path)
 {
     if (path.empty() || path.front() != '/' || has_control_character(path))
         return false;
-    for (const auto& component : fs::path(std::string(path))) {
-        if (component == "." || component == "..")
-            return false;
-    }
-    return true;
+    const auto components = split(path, '/');
+    return std::none_of(components.begin(), components.end(),
+                        [](const std::string& component) { return component == "." || component == ".."; });
 }
 
 std::vector<ShareEntry> load_shares()
@@ -108,23 +105,24 @@ void link_share(const ShareEntry& share)
 {
     if (!is_storable_share_name(share.name) || !is_storable_share_path(share.path))
         return;
-    std::error_code ignored;
-    fs::create_directories(share.path, ignored);
-    fs::create_directories("/shares", ignored);
-    const fs::path link = fs::path("/shares") / share.name;
-    if (fs::is_symlink(link, ignored))
-        fs::remove(link, ignored);
-    else if (fs::exists(link, ignored))
-        return;
-    fs::create_symlink(share.path, link, ignored);
+    make_directories(share.path);
+    make_directories("/shares");
+    const std::string link = "/shares/" + share.name;
+    struct stat status {};
+    if (::lstat(link.c_str(), &status) == 0) {
+        if (!S_ISLNK(status.st_mode))
+            return;
+        ::unlink(link.c_str());
+    }
+    ::symlink(share.path.c_str(), link.c_str());
 }
 
 void unlink_share(std::string_view name)
 {
     if (!is_storable_share_name(name))
         return;
-    std::error_code ignored;
-    const fs::path link = fs::path("/shares") / std::string(name);
-    if (fs::is_symlink(link, ignored))
-        fs::remove(link, ignored);
+    const std::string link = "/shares/" + std::string(name);
+    struct stat status {};
+    if (::lstat(link.c_str(), &status) == 0 && S_ISLNK(status.st_mode))
+        ::unlink(link.c_str());
 }

@@ -10,13 +10,12 @@
 
 #include <cstdlib>
 #include <cstring>
-#include <filesystem>
 #include <string>
+#include <sys/stat.h>
 
 #include "cgi/atomic_file.h"
 #include "journal.h"
-
-namespace fs = std::filesystem;
+#include "text_file.h"
 
 namespace {
 
@@ -43,8 +42,8 @@ extern "C" char* getDataLocationByVolume(const char* name, const char* volume)
 {
     journal_record("getDataLocationByVolume", {name, volume});
     const std::string path = item_path(volume, name);
-    std::error_code ignored;
-    if (!fs::is_regular_file(path, ignored))
+    struct stat status {};
+    if (::stat(path.c_str(), &status) != 0 || !S_ISREG(status.st_mode))
         return nullptr;
     return strdup(path.c_str());
 }
@@ -52,10 +51,10 @@ extern "C" char* getDataLocationByVolume(const char* name, const char* volume)
 extern "C" int saveDataToHiddenByVolume(const char* file, const char* volume)
 {
     journal_record("saveDataToHiddenByVolume", {file, volume});
-    const std::string target = item_path(volume, fs::path(file).filename().string());
-    std::error_code failed;
-    fs::create_directories(fs::path(target).parent_path(), failed);
-    if (failed)
+    const std::string_view path(file);
+    const std::string target = item_path(volume, path.substr(path.rfind('/') + 1));
+    const auto slash = target.rfind('/');
+    if (!make_directories(slash == 0 ? "/" : target.substr(0, slash)))
         return -1;
     // The volume's copy is replaced at once: a reader sees the old or the new rules.
     std::string content;

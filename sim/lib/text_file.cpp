@@ -1,5 +1,8 @@
 #include "text_file.h"
 
+#include <cerrno>
+#include <sys/stat.h>
+
 #include "cgi/atomic_file.h"
 
 std::string read_text(const std::string& path)
@@ -37,6 +40,19 @@ bool write_lines(const std::string& path, const std::vector<std::string>& lines)
         content += '\n';
     }
     return replace_file(path, content);
+}
+
+bool make_directories(const std::string& path)
+{
+    for (std::size_t slash = path.find('/', 1);; slash = path.find('/', slash + 1)) {
+        const std::string folder = path.substr(0, slash);
+        if (!folder.empty() && ::mkdir(folder.c_str(), 0777) != 0 && errno != EEXIST)
+            return false;
+        if (slash == std::string::npos)
+            break;
+    }
+    struct stat status {};
+    return ::stat(path.c_str(), &status) == 0 && S_ISDIR(status.st_mode);
 }
 
 std::vector<std::string> split(std::string_view text, char separator)

@@ -18,6 +18,9 @@ std::vector<std::string> read_lines(const std::string& path);
 // cgi/atomic_file.h): on failure the old file stays as it was. The caller holds the
 // file's lock when it read the lines it now writes back.
 bool write_lines(const std::string& path, const std::vector<std::string>& lines);
+// Makes the folder and its missing parents, as `mkdir -p` does; false when one of them
+// cannot be made or is not a folder.
+bool make_directories(const std::string& path);
 // Splits at every `separator`; "a\t\tb" gives three fields.
 std::vector<std::string> split(std::string_view text, char separator);
 std::string join(const std::vector<std::string>& fields, char separator);

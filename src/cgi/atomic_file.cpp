@@ -85,16 +85,23 @@ bool read_whole_file(const std::string& path, std::string& content)
     Descriptor file(::open(path.c_str(), O_RDONLY | O_CLOEXEC));
     if (!file.valid())
         return false;
-    content.clear();
-    std::array<char, 65536> chunk;
+    // Straight into the text, sized by the file's length and a byte more, so that the end
+    // shows without growing it; a file that grows meanwhile, or has no length (/proc),
+    // is read on.
+    struct stat status {};
+    const bool sized = ::fstat(file.get(), &status) == 0 && status.st_size > 0;
+    content.resize(sized ? static_cast<std::size_t>(status.st_size) + 1 : 4096);
+    std::size_t used = 0;
     for (;;) {
-        const ssize_t n = ::read(file.get(), chunk.data(), chunk.size());
+        if (used == content.size())
+            content.resize(2 * content.size());
+        const ssize_t n = ::read(file.get(), content.data() + used, content.size() - used);
         if (n < 0 && errno == EINTR)
             continue;
-        if (n < 0)
-            return false;
-        if (n == 0)
-            return true;
-        content.append(chunk.data(), static_cast<std::size_t>(n));
+        if (n <= 0) {
+            content.resize(used);
+            return n == 0;
+        }
+        used += static_cast<std::size_t>(n);
     }
 }
