@@ -69,29 +69,6 @@ void PrintTo(const Case& c, std::ostream* out)
     *out << c.file << ".cases " << c.name;
 }
 
-std::string unescaped(std::string_view text)
-{
-    std::string out;
-    for (std::size_t i = 0; i < text.size(); ++i) {
-        if (text[i] != '\\' || i + 1 == text.size()) {
-            out += text[i];
-            continue;
-        }
-        const char next = text[i + 1];
-        if (next == 'x' && i + 3 < text.size() && std::isxdigit(static_cast<unsigned char>(text[i + 2])) &&
-            std::isxdigit(static_cast<unsigned char>(text[i + 3]))) {
-            out += static_cast<char>(std::stoi(std::string(text.substr(i + 2, 2)), nullptr, 16));
-            i += 3;
-            continue;
-        }
-        const std::string_view plain = "nrt\\\"", bytes = "\n\r\t\\\"";
-        const auto at = plain.find(next);
-        out += at == std::string_view::npos ? std::string(1, '\\') : std::string(1, bytes[at]);
-        i += at == std::string_view::npos ? 0 : 1;
-    }
-    return out;
-}
-
 // Words at blanks; "..." groups (escapes inside and out).
 std::vector<std::string> words(std::string_view text)
 {

@@ -142,14 +142,14 @@ TEST(DataSafety, AReaderNeverSeesARewrittenFileTorn)
     for (int i = 0; i < 10; ++i)
         rules += nfs_rule("/nfs/S" + std::to_string(i), "10.0.0.1") + "\n";
     dev.write_file("/etc/exports", rules);
-    dev.install_probe("stress_probe");
+    dev.install_probe("probe");
     // 200 rewrites in four streams through the program's own code, as requests do
     // them: 100 saves of config.xml, 100 rewrites of /etc/exports.
-    run_script(dev, "", {"/sbin/stress_probe rewrite config 50 >>/tmp/rewrites",
-                         "/sbin/stress_probe rewrite exports 50 >>/tmp/rewrites",
-                         "/sbin/stress_probe rewrite config 50 >>/tmp/rewrites",
-                         "/sbin/stress_probe rewrite exports 50 >>/tmp/rewrites",
-                         "/sbin/stress_probe read 1000 1000 /etc/exports /etc/NAS_CFG/config.xml >/tmp/torn"});
+    run_script(dev, "", {"/sbin/probe rewrite config 50 >>/tmp/rewrites",
+                         "/sbin/probe rewrite exports 50 >>/tmp/rewrites",
+                         "/sbin/probe rewrite config 50 >>/tmp/rewrites",
+                         "/sbin/probe rewrite exports 50 >>/tmp/rewrites",
+                         "/sbin/probe read 1000 1000 /etc/exports /etc/NAS_CFG/config.xml >/tmp/torn"});
     EXPECT_EQ(dev.read_file("/tmp/torn"), "0 of 1000\n");
     EXPECT_EQ(dev.read_file("/tmp/rewrites"), "0 failed\n0 failed\n0 failed\n0 failed\n");
     EXPECT_EQ(dev.lines("/etc/exports").size(), 10u);

@@ -53,43 +53,14 @@ std::vector<std::string> base_environment()
     return env;
 }
 
-Event split_event(const std::string& line)
-{
-    Event event;
-    std::string field;
-    for (std::size_t i = 0; i < line.size(); ++i) {
-        const char c = line[i];
-        if (c == '\t') {
-            event.push_back(field);
-            field.clear();
-        } else if (c == '\\' && i + 1 < line.size()) {
-            const char next = line[++i];
-            field += next == 't' ? '\t' : next == 'n' ? '\n' : next;
-        } else {
-            field += c;
-        }
-    }
-    event.push_back(field);
-    return event;
-}
-
+// The node of a key ("/system_mgr/nfs/enable") below the document element; `create`
+// adds what is missing.
 pugi::xml_node config_key(pugi::xml_document& doc, std::string_view key, bool create)
 {
     pugi::xml_node node = doc.document_element();
-    std::string_view rest = key;
-    while (!rest.empty() && node) {
-        if (rest.front() == '/') {
-            rest.remove_prefix(1);
-            continue;
-        }
-        const auto slash = rest.find('/');
-        const std::string name(rest.substr(0, slash));
-        pugi::xml_node child = node.child(name.c_str());
-        if (!child && create)
-            child = node.append_child(name.c_str());
-        node = child;
-        rest = slash == std::string_view::npos ? std::string_view{} : rest.substr(slash);
-    }
+    std::istringstream names{std::string(key.substr(1))};
+    for (std::string name; node && std::getline(names, name, '/');)
+        node = node.child(name.c_str()) || !create ? node.child(name.c_str()) : node.append_child(name.c_str());
     return node;
 }
 
@@ -215,8 +186,13 @@ Reply Device::run(const std::vector<std::string>& argv, const Fields& environmen
 Journal Device::journal() const
 {
     Journal events;
-    for (const std::string& line : lines("/var/log/platform.log"))
-        events.push_back(split_event(line));
+    for (const std::string& line : lines("/var/log/platform.log")) {
+        events.emplace_back();
+        for (std::size_t begin = 0, tab = 0; tab != std::string::npos; begin = tab + 1) {
+            tab = line.find('\t', begin);
+            events.back().push_back(unescaped(line.substr(begin, tab - begin)));
+        }
+    }
     return events;
 }
 
@@ -224,6 +200,29 @@ void Device::clear_records()
 {
     for (const char* log : {"/var/log/platform.log", "/var/log/messages", "/var/log/console"})
         write_file(log, "");
+}
+
+std::string unescaped(std::string_view text)
+{
+    std::string out;
+    for (std::size_t i = 0; i < text.size(); ++i) {
+        if (text[i] != '\\' || i + 1 == text.size()) {
+            out += text[i];
+            continue;
+        }
+        const char next = text[i + 1];
+        if (next == 'x' && i + 3 < text.size() && std::isxdigit(static_cast<unsigned char>(text[i + 2])) &&
+            std::isxdigit(static_cast<unsigned char>(text[i + 3]))) {
+            out += static_cast<char>(std::stoi(std::string(text.substr(i + 2, 2)), nullptr, 16));
+            i += 3;
+            continue;
+        }
+        const std::string_view plain = "nrt\\\"", bytes = "\n\r\t\\\"";
+        const auto at = plain.find(next);
+        out += at == std::string_view::npos ? std::string(1, '\\') : std::string(1, bytes[at]);
+        i += at == std::string_view::npos ? 0 : 1;
+    }
+    return out;
 }
 
 std::string query_string(std::string_view cmd, const Fields& fields)
@@ -239,13 +238,8 @@ std::string url_encode(std::string_view value)
     constexpr std::string_view kHex = "0123456789ABCDEF";
     std::string encoded;
     for (const unsigned char c : value) {
-        if (std::isalnum(c) || c == '-' || c == '_' || c == '.' || c == '~') {
-            encoded += static_cast<char>(c);
-        } else {
-            encoded += '%';
-            encoded += kHex[c >> 4];
-            encoded += kHex[c & 15];
-        }
+        const bool plain = std::isalnum(c) || std::string_view("-_.~").find(static_cast<char>(c)) != std::string_view::npos;
+        encoded += plain ? std::string(1, static_cast<char>(c)) : std::string{'%', kHex[c >> 4], kHex[c & 15]};
     }
     return encoded;
 }

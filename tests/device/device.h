@@ -79,6 +79,8 @@ inline const std::string kEmptyHtml = "Content-Type: text/html\r\n\r\n";
 // A foreground command line and the tool event the shell makes of it: words split at
 // blanks, quotes removed ('\'' is a quote inside a word), redirections from ">" on dropped.
 Journal ran(const std::string& line);
+// The escapes \n \r \t \\ \" and \xHH as their bytes; other backslashes stay.
+std::string unescaped(std::string_view text);
 // A host file's whole content ("" when there is none).
 std::string slurp(const std::string& path);
 // Base64 as the pages send passwords.
