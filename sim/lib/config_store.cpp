@@ -1,5 +1,6 @@
-// The config store over "/etc/NAS_CFG/config.xml". The file is parsed at most once
-// per process; changes stay in the loaded document until xml_write_file saves it.
+// The config store over "/etc/NAS_CFG/config.xml". The file is read at most once per
+// process; lookups use an index of it (config_index.h) until a key is set, then a
+// pugixml document of it, where changes stay until xml_write_file saves them.
 // Reads are not events of the device; changes are recorded in the journal.
 //
 // Two requests may change different keys at the same time. So a change is also kept
@@ -9,11 +10,9 @@
 // stored meanwhile is kept, and readers see the old or the new file, never a part.
 #include "platform/config_store.h"
 
-#include <array>
 #include <cerrno>
 #include <cstdlib>
 #include <cstring>
-#include <functional>
 #include <pugixml.hpp>
 #include <string>
 #include <string_view>
@@ -22,52 +21,49 @@
 
 #include "cgi/atomic_file.h"
 #include "cgi/file_lock.h"
+#include "config_index.h"
 #include "journal.h"
 
 namespace {
 
 constexpr const char* kConfigFile = "/etc/NAS_CFG/config.xml";
 
-// pugixml's memory comes from one block of the process first: a request's store is a
-// few KiB, and a heap page of 32 KiB for it would touch more memory than it uses.
-alignas(16) std::array<unsigned char, 64 * 1024> arena;
-std::size_t arena_used = 0;
-
-void* arena_allocate(std::size_t size)
+// The file as this process read it first. Until a key is set, lookups go to its index;
+// a file that is not in the plain form, and any change, go to a pugixml document of it.
+const std::string& file_text()
 {
-    const std::size_t rounded = (size + 15) & ~std::size_t{15};
-    if (rounded > arena.size() - arena_used)
-        return std::malloc(size);
-    void* block = arena.data() + arena_used;
-    arena_used += rounded;
-    return block;
+    static const std::string text = [] {
+        std::string read;
+        if (!read_whole_file(kConfigFile, read))
+            read.clear();
+        return read;
+    }();
+    return text;
 }
 
-void arena_deallocate(void* block)
+void load(pugi::xml_document& doc, const std::string& text)
 {
-    const auto* byte = static_cast<const unsigned char*>(block);
-    const std::less<const unsigned char*> before;
-    if (before(byte, arena.data()) || !before(byte, arena.data() + arena.size()))
-        std::free(block);
-}
-
-void load(pugi::xml_document& doc, const char* file)
-{
-    pugi::set_memory_management_functions(arena_allocate, arena_deallocate);
-    std::string text;
-    if (!read_whole_file(file, text) || !doc.load_buffer(text.data(), text.size()))
+    if (!doc.load_buffer(text.data(), text.size()))
         doc.reset();
     if (!doc.document_element())
         doc.append_child("config");
 }
 
+const ConfigIndex* file_index()
+{
+    static ConfigIndex index;
+    static const bool plain = index.index(file_text());
+    return plain ? &index : nullptr;
+}
+
+bool document_loaded = false;
+
 pugi::xml_document& document()
 {
     static pugi::xml_document doc;
-    static bool loaded = false;
-    if (!loaded) {
-        loaded = true;
-        load(doc, kConfigFile);
+    if (!document_loaded) {
+        document_loaded = true;
+        load(doc, file_text());
     }
     return doc;
 }
@@ -104,6 +100,17 @@ pugi::xml_node find_key(const char* path)
     return node;
 }
 
+// The key's text, or nullptr when the store has no such key.
+const char* key_value(const char* path)
+{
+    if (const ConfigIndex* index = file_index(); index && !document_loaded) {
+        const std::string* value = index->value(path);
+        return value ? value->c_str() : nullptr;
+    }
+    const pugi::xml_node key = find_key(path);
+    return key ? key.child_value() : nullptr;
+}
+
 pugi::xml_node find_or_create_key(pugi::xml_document& doc, const char* path)
 {
     pugi::xml_node node = doc.document_element();
@@ -126,10 +133,9 @@ pugi::xml_node find_or_create_key(pugi::xml_document& doc, const char* path)
 
 extern "C" int xml_get_str(const char* path, int size, char* buffer)
 {
-    const pugi::xml_node key = find_key(path);
-    if (!key || size <= 0)
+    const char* text = key_value(path);
+    if (!text || size <= 0)
         return -1;
-    const char* text = key.child_value();
     const std::size_t n = std::min(std::strlen(text), static_cast<std::size_t>(size - 1));
     std::memcpy(buffer, text, n);
     buffer[n] = '\0';
@@ -138,10 +144,9 @@ extern "C" int xml_get_str(const char* path, int size, char* buffer)
 
 extern "C" int xml_get_int(const char* path)
 {
-    const pugi::xml_node key = find_key(path);
-    if (!key)
+    const char* text = key_value(path);
+    if (!text)
         return -1;
-    const char* text = key.child_value();
     char* end = nullptr;
     errno = 0;
     const long value = std::strtol(text, &end, 10);
@@ -165,7 +170,10 @@ extern "C" int xml_write_file(const char* file)
     if (!lock)
         return -1;
     pugi::xml_document current;
-    load(current, file);
+    std::string text;
+    if (!read_whole_file(file, text))
+        text.clear();
+    load(current, text);
     for (const auto& [path, value] : changes())
         find_or_create_key(current, path.c_str()).text().set(value.c_str());
     TextWriter saved;

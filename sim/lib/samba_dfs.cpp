@@ -34,8 +34,19 @@ namespace {
 constexpr int kDone = 0;
 constexpr int kRefused = -1;
 
-RecordBlock link_records;
-RecordBlock name_records;
+// Made on first use, so that a process that lists nothing does not run their set-up
+// and clean-up.
+RecordBlock& link_records()
+{
+    static RecordBlock block;
+    return block;
+}
+
+RecordBlock& name_records()
+{
+    static RecordBlock block;
+    return block;
+}
 
 bool storable(std::string_view text)
 {
@@ -45,7 +56,7 @@ bool storable(std::string_view text)
 void fill_names(const std::vector<std::string>& names)
 {
     pnl = nullptr;
-    const auto records = name_records.hold<name_list>(names.size());
+    const auto records = name_records().hold<name_list>(names.size());
     for (std::size_t i = 0; i < records.size(); ++i)
         copy_text_field(records[i].name, names[i]);
     pnl = records.empty() ? nullptr : records.data();
@@ -125,7 +136,7 @@ extern "C" int get_dfs_info(void)
     pdfs = nullptr;
     const std::string store = read_text(kDfsLinksPath);
     const std::vector<DfsLinkText> links = dfs_link_texts(store);
-    const auto records = link_records.hold<dfs_info>(links.size());
+    const auto records = link_records().hold<dfs_info>(links.size());
     for (std::size_t i = 0; i < records.size(); ++i) {
         copy_text_field(records[i].host, links[i].host);
         copy_text_field(records[i].share, links[i].path);
@@ -196,7 +207,7 @@ extern "C" int get_host_share_name(const char* host)
 void release_dfs_lists()
 {
     pdfs = nullptr;
-    link_records.release();
+    link_records().release();
     pnl = nullptr;
-    name_records.release();
+    name_records().release();
 }

@@ -20,7 +20,13 @@ struct share_info* pss = nullptr;
 
 namespace {
 
-RecordBlock share_records;
+// Made on first use, so that a process that lists nothing does not run its set-up and
+// clean-up.
+RecordBlock& share_records()
+{
+    static RecordBlock block;
+    return block;
+}
 
 } // namespace
 
@@ -31,7 +37,7 @@ extern "C" int get_samba_info2(void)
     const std::string store = read_text(kShareStorePath);
     std::vector<std::pair<std::string_view, std::string_view>> shares;
     for_each_share_location(store, [&](std::string_view name, std::string_view path) { shares.emplace_back(name, path); });
-    const auto records = share_records.hold<share_info>(shares.size());
+    const auto records = share_records().hold<share_info>(shares.size());
     if (records.size() != shares.size())
         return -1;
     for (std::size_t i = 0; i < shares.size(); ++i) {
@@ -46,6 +52,6 @@ extern "C" void Free_All_List(void)
 {
     journal_record("Free_All_List", {});
     pss = nullptr;
-    share_records.release();
+    share_records().release();
     release_dfs_lists();
 }

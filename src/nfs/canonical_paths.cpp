@@ -90,8 +90,8 @@ std::optional<CanonicalStep> listed_step(const DirectoryListing& listing, const 
     return CanonicalStep{path, 0, false};
 }
 
-const CanonicalStep kUndecided{std::nullopt, 0, true};
-const CanonicalStep kLoop{std::nullopt, kMostLinks + 1, false};
+constexpr CanonicalStep kUndecided{std::nullopt, 0, true};
+constexpr CanonicalStep kLoop{std::nullopt, kMostLinks + 1, false};
 
 struct Stepper {
     std::unordered_map<std::string, CanonicalStep>& steps;
