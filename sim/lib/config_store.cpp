@@ -23,6 +23,7 @@
 #include "cgi/file_lock.h"
 #include "config_index.h"
 #include "journal.h"
+#include "text_file.h"
 
 namespace {
 
@@ -32,12 +33,7 @@ constexpr const char* kConfigFile = "/etc/NAS_CFG/config.xml";
 // a file that is not in the plain form, and any change, go to a pugixml document of it.
 const std::string& file_text()
 {
-    static const std::string text = [] {
-        std::string read;
-        if (!read_whole_file(kConfigFile, read))
-            read.clear();
-        return read;
-    }();
+    static const std::string text = read_text(kConfigFile);
     return text;
 }
 
@@ -103,9 +99,11 @@ pugi::xml_node find_key(const char* path)
 // The key's text, or nullptr when the store has no such key.
 const char* key_value(const char* path)
 {
-    if (const ConfigIndex* index = file_index(); index && !document_loaded) {
-        const std::string* value = index->value(path);
-        return value ? value->c_str() : nullptr;
+    if (!document_loaded) {
+        if (const ConfigIndex* index = file_index()) {
+            const std::string* value = index->value(path);
+            return value ? value->c_str() : nullptr;
+        }
     }
     const pugi::xml_node key = find_key(path);
     return key ? key.child_value() : nullptr;
@@ -170,10 +168,7 @@ extern "C" int xml_write_file(const char* file)
     if (!lock)
         return -1;
     pugi::xml_document current;
-    std::string text;
-    if (!read_whole_file(file, text))
-        text.clear();
-    load(current, text);
+    load(current, read_text(file));
     for (const auto& [path, value] : changes())
         find_or_create_key(current, path.c_str()).text().set(value.c_str());
     TextWriter saved;
