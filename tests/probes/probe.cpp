@@ -2,7 +2,6 @@
 // The exports engine:
 //   probe format FOLDER HOST RW ROOT_SQUASH HIDDEN     the line, in brackets
 //   probe add|hadd FOLDER HOST RW ROOT_SQUASH           the operation's result
-//   probe modify|hmodify FOLDER HOST NEWIP RW ROOT_SQUASH
 //   probe delete|hdelete FOLDER HOST
 //   (a HOST of "(none)" passes no host at all)
 // The shared helpers:
@@ -70,10 +69,6 @@ int main(int argc, char** argv)
         std::printf("%d", add_config_string(folder, host, number(4), number(5)));
     } else if (what == "hadd" && argc == 6) {
         std::printf("%d", add_hidden_config_string(folder, host, number(4), number(5)));
-    } else if (what == "modify" && argc == 7) {
-        std::printf("%d", modify_config_string(folder, host, argv[4], number(5), number(6)));
-    } else if (what == "hmodify" && argc == 7) {
-        std::printf("%d", modify_hidden_config_string(folder, host, argv[4], number(5), number(6)));
     } else if (what == "delete" && argc == 4) {
         std::printf("%d", delete_config_string(folder, host));
     } else if (what == "hdelete" && argc == 4) {
