@@ -103,6 +103,7 @@ int ConfigIndex::open_element(std::string_view name, int parent)
 bool ConfigIndex::index(std::string_view text)
 {
     m_elements.clear();
+    m_decoded.clear();
     // An element has a start tag, and mostly an end tag too.
     m_elements.reserve(static_cast<std::size_t>(std::count(text.begin(), text.end(), '<')) / 2 + 1);
     std::size_t at = 0;
@@ -119,13 +120,13 @@ bool ConfigIndex::index(std::string_view text)
         const std::size_t tag = text.find('<', at);
         const std::string_view chunk = text.substr(at, tag == std::string_view::npos ? tag : tag - at);
         if (!only_blanks(chunk)) {
-            if (open < 0 || !decode(chunk, decoded))
+            // Most texts have no reference: their value is the file's own bytes.
+            const bool plain = chunk.find_first_of(std::string_view("&\r\0", 3)) == std::string_view::npos;
+            if (open < 0 || (!plain && !decode(chunk, decoded)))
                 return false;
             Element& element = m_elements[static_cast<std::size_t>(open)];
-            if (!element.has_text) {
-                element.text = decoded;
-                element.has_text = true;
-            }
+            if (element.text.data() == nullptr)
+                element.text = plain ? chunk : std::string_view(m_decoded.emplace_front(decoded));
         }
         if (tag == std::string_view::npos)
             break;
@@ -158,10 +159,10 @@ bool ConfigIndex::index(std::string_view text)
     return rooted && open < 0;
 }
 
-const std::string* ConfigIndex::value(std::string_view path) const
+std::optional<std::string_view> ConfigIndex::value(std::string_view path) const
 {
     if (m_elements.empty())
-        return nullptr;
+        return std::nullopt;
     int node = 0;
     while (!path.empty() && node >= 0) {
         if (path.front() == '/') {
@@ -175,5 +176,7 @@ const std::string* ConfigIndex::value(std::string_view path) const
             child = m_elements[static_cast<std::size_t>(child)].next_sibling;
         node = child;
     }
-    return node >= 0 ? &m_elements[static_cast<std::size_t>(node)].text : nullptr;
+    if (node < 0)
+        return std::nullopt;
+    return m_elements[static_cast<std::size_t>(node)].text;
 }

@@ -9,6 +9,8 @@
 // as pugixml reads it.
 #pragma once
 
+#include <forward_list>
+#include <optional>
 #include <string>
 #include <string_view>
 #include <vector>
@@ -18,22 +20,24 @@ public:
     // Indexes `text`, which must outlive the index; false when it is not in the plain form.
     bool index(std::string_view text);
 
-    // The element at a slash path below the root element ("/system_mgr/nfs/enable"; empty
-    // components are skipped), or nullptr. Its value is its first text that is not only
-    // blanks, as pugixml's child_value() gives it.
-    const std::string* value(std::string_view path) const;
+    // The value of the element at a slash path below the root element
+    // ("/system_mgr/nfs/enable"; empty components are skipped), or nothing. Its value is
+    // its first text that is not only blanks, as pugixml's child_value() gives it.
+    std::optional<std::string_view> value(std::string_view path) const;
 
 private:
+    // Small, its text a piece of the file itself where it can be, so that the index of
+    // a config file takes less memory than the file.
     struct Element {
         std::string_view name;
+        std::string_view text;   // data() is null until the element has a text
         int first_child = -1;
         int last_child = -1;
         int next_sibling = -1;
         int parent = -1;
-        bool has_text = false;
-        std::string text;
     };
     int open_element(std::string_view name, int parent);
 
     std::vector<Element> m_elements;
+    std::forward_list<std::string> m_decoded;   // the texts that had references, decoded
 };

@@ -10,9 +10,9 @@
 // stored meanwhile is kept, and readers see the old or the new file, never a part.
 #include "platform/config_store.h"
 
-#include <cerrno>
-#include <cstdlib>
+#include <climits>
 #include <cstring>
+#include <optional>
 #include <pugixml.hpp>
 #include <string>
 #include <string_view>
@@ -96,17 +96,15 @@ pugi::xml_node find_key(const char* path)
     return node;
 }
 
-// The key's text, or nullptr when the store has no such key.
-const char* key_value(const char* path)
+// The key's text, or nothing when the store has no such key.
+std::optional<std::string_view> key_value(const char* path)
 {
     if (!document_loaded) {
-        if (const ConfigIndex* index = file_index()) {
-            const std::string* value = index->value(path);
-            return value ? value->c_str() : nullptr;
-        }
+        if (const ConfigIndex* index = file_index())
+            return index->value(path);
     }
     const pugi::xml_node key = find_key(path);
-    return key ? key.child_value() : nullptr;
+    return key ? std::optional<std::string_view>(key.child_value()) : std::nullopt;
 }
 
 pugi::xml_node find_or_create_key(pugi::xml_document& doc, const char* path)
@@ -127,30 +125,48 @@ pugi::xml_node find_or_create_key(pugi::xml_document& doc, const char* path)
     return node;
 }
 
+// The number at the start of the text as strtol reads it in base 10 (blanks, a sign,
+// digits), or nothing when there is none or it does not fit a long. Written out here
+// because strtol's code and its character tables are two pages a request need not load.
+std::optional<long> decimal(std::string_view text)
+{
+    const auto is_digit = [&] { return !text.empty() && text.front() >= '0' && text.front() <= '9'; };
+    while (!text.empty() && (text.front() == ' ' || (text.front() >= '\t' && text.front() <= '\r')))
+        text.remove_prefix(1);
+    const bool negative = text.starts_with('-');
+    if (negative || text.starts_with('+'))
+        text.remove_prefix(1);
+    if (!is_digit())
+        return std::nullopt;
+    unsigned long magnitude = 0;
+    const unsigned long limit = negative ? 0ul - static_cast<unsigned long>(LONG_MIN) : LONG_MAX;
+    for (; is_digit(); text.remove_prefix(1)) {
+        const auto digit = static_cast<unsigned long>(text.front() - '0');
+        if (magnitude > (limit - digit) / 10)
+            return std::nullopt;
+        magnitude = magnitude * 10 + digit;
+    }
+    return negative ? static_cast<long>(0ul - magnitude) : static_cast<long>(magnitude);
+}
+
 } // namespace
 
 extern "C" int xml_get_str(const char* path, int size, char* buffer)
 {
-    const char* text = key_value(path);
+    const std::optional<std::string_view> text = key_value(path);
     if (!text || size <= 0)
         return -1;
-    const std::size_t n = std::min(std::strlen(text), static_cast<std::size_t>(size - 1));
-    std::memcpy(buffer, text, n);
+    const std::size_t n = std::min(text->size(), static_cast<std::size_t>(size - 1));
+    std::memcpy(buffer, text->data(), n);
     buffer[n] = '\0';
     return 0;
 }
 
 extern "C" int xml_get_int(const char* path)
 {
-    const char* text = key_value(path);
-    if (!text)
-        return -1;
-    char* end = nullptr;
-    errno = 0;
-    const long value = std::strtol(text, &end, 10);
-    if (end == text || errno != 0)
-        return -1;
-    return static_cast<int>(value);
+    const std::optional<std::string_view> text = key_value(path);
+    const std::optional<long> value = text ? decimal(*text) : std::nullopt;
+    return value ? static_cast<int>(*value) : -1;
 }
 
 extern "C" int xml_set_str(const char* path, const char* value)
