@@ -5,7 +5,8 @@
 
 #include "cgi/atomic_file.h"
 
-std::string read_text(const std::string& path)
+// Hot, as read_whole_file: every request that reads the config file runs it.
+[[gnu::hot]] std::string read_text(const std::string& path)
 {
     std::string text;
     if (!read_whole_file(path, text))
