@@ -178,5 +178,7 @@ std::optional<std::string_view> ConfigIndex::value(std::string_view path) const
     }
     if (node < 0)
         return std::nullopt;
-    return m_elements[static_cast<std::size_t>(node)].text;
+    // An element without a text has the empty one (never a null pointer to copy from).
+    const std::string_view text = m_elements[static_cast<std::size_t>(node)].text;
+    return text.data() ? text : std::string_view("");
 }

@@ -10,8 +10,8 @@
 // stored meanwhile is kept, and readers see the old or the new file, never a part.
 #include "platform/config_store.h"
 
+#include <algorithm>
 #include <climits>
-#include <cstring>
 #include <optional>
 #include <pugixml.hpp>
 #include <string>
@@ -157,7 +157,7 @@ extern "C" int xml_get_str(const char* path, int size, char* buffer)
     if (!text || size <= 0)
         return -1;
     const std::size_t n = std::min(text->size(), static_cast<std::size_t>(size - 1));
-    std::memcpy(buffer, text->data(), n);
+    text->copy(buffer, n);
     buffer[n] = '\0';
     return 0;
 }
