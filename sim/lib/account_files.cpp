@@ -90,15 +90,16 @@ bool is_member(const ColonRow& group_row, std::string_view user)
 
 bool member_text_lists(std::string_view text, std::string_view user)
 {
-    // Scans the member text without splitting it: allaccount lists every user.
+    // Looks for the name in the member text without splitting it (allaccount lists
+    // every user): a place where it stands between commas or the ends is a member.
     if (text.empty())
         return false;
-    std::size_t begin = 0;
-    while (begin <= text.size()) {
-        const auto end = std::min(text.find(',', begin), text.size());
-        if (text.substr(begin, end - begin) == user)
+    if (user.empty())
+        return text.front() == ',' || text.back() == ',' || text.find(",,") != std::string_view::npos;
+    for (std::size_t at = text.find(user); at != std::string_view::npos; at = text.find(user, at + 1)) {
+        const std::size_t end = at + user.size();
+        if ((at == 0 || text[at - 1] == ',') && (end == text.size() || text[end] == ','))
             return true;
-        begin = end + 1;
     }
     return false;
 }

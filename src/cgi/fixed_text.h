@@ -11,6 +11,7 @@
 #include <cstring>
 #include <memory>
 #include <string_view>
+#include <sys/mman.h>
 
 template <std::size_t N>
 class FixedText {
@@ -58,13 +59,19 @@ private:
     std::array<char, N> m_bytes;
 };
 
-// A zero-filled buffer of N bytes that a library fills with a C string, kept on the
-// heap: calloc hands out fresh memory without writing to it, so of a large buffer
-// only the pages the library writes are ever touched.
+// A zero-filled buffer of N bytes that a library fills with a C string, mapped on its
+// own: the kernel's fresh pages are zero, so of a large buffer only the pages the
+// library writes are ever touched (calloc clears what the heap held before, a page
+// fault a page).
 template <std::size_t N>
 class ZeroedBuffer {
 public:
-    ZeroedBuffer() : m_bytes(static_cast<char*>(std::calloc(N, 1))) {}
+    ZeroedBuffer()
+    {
+        void* bytes = mmap(nullptr, N, PROT_READ | PROT_WRITE, MAP_PRIVATE | MAP_ANONYMOUS, -1, 0);
+        if (bytes != MAP_FAILED)
+            m_bytes.reset(static_cast<char*>(bytes));
+    }
     explicit operator bool() const { return m_bytes != nullptr; }
 
     char* data() { return m_bytes.get(); }
@@ -76,8 +83,8 @@ public:
     void clear_string() { std::memset(m_bytes.get(), 0, strnlen(m_bytes.get(), N)); }
 
 private:
-    struct Free {
-        void operator()(char* bytes) const { std::free(bytes); }
+    struct Unmap {
+        void operator()(char* bytes) const { munmap(bytes, N); }
     };
-    std::unique_ptr<char, Free> m_bytes;
+    std::unique_ptr<char, Unmap> m_bytes;
 };

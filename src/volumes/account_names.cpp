@@ -157,60 +157,66 @@ bool AccountLineReader::keep_head(const char* piece, std::size_t length, std::si
 
 // The name of a well-formed line that lies whole in the block: a name that begins with
 // none of the characters the readers treat apart, a password field, numbers of a few
-// digits each, a line end. Nothing, with the line left unread, for any other line,
-// which next() and account_entry_name() then weigh; on such lines both find the same.
-std::optional<std::string_view> AccountLineReader::plain_entry_name()
+// digits each, a line end. False, with the line left unread, for any other line, which
+// next() and account_entry_name() then weigh; on such lines both find the same.
+// The fields are short: once the line end is found they are walked a character at a
+// time, and the line end stops every walk.
+bool AccountLineReader::plain_entry_name(std::string_view& name)
 {
     if (m_block_holds_nul)
-        return std::nullopt;
+        return false;
     const char* const start = m_block.get() + m_begin;
     const auto* const line_end = static_cast<const char*>(std::memchr(start, '\n', m_end - m_begin));
     if (!line_end || line_end == start)
-        return std::nullopt;
+        return false;
     const char first = *start;
     if (first == '#' || first == '+' || first == '-' || first == ':' || is_blank(first))
-        return std::nullopt;
-    const auto* const name_end = static_cast<const char*>(std::memchr(start, ':', static_cast<std::size_t>(line_end - start)));
-    if (!name_end)
-        return std::nullopt;
-    const char* at = name_end + 1;
-    const auto* const password_end = static_cast<const char*>(std::memchr(at, ':', static_cast<std::size_t>(line_end - at)));
-    if (!password_end)
-        return std::nullopt;
-    at = password_end + 1;
+        return false;
+    const char* at = start;
+    while (*at != ':' && *at != '\n')
+        ++at;
+    if (at == line_end)
+        return false;
+    const char* const name_end = at++;
+    while (*at != ':' && *at != '\n')
+        ++at;
+    if (at++ == line_end)
+        return false;
     const int numbers = m_kind == AccountFile::Passwd ? 2 : 1;
     for (int field = 0; field < numbers; ++field) {
         // At most nine digits: the value fits 32 bits without a look.
         const char* const digits = at;
-        const char* const most = digits + std::min<std::ptrdiff_t>(line_end - digits, 10);
-        while (at < most && static_cast<unsigned char>(*at - '0') < 10)
+        while (static_cast<unsigned char>(*at - '0') < 10)
             ++at;
         if (at == digits || at - digits > 9)
-            return std::nullopt;
+            return false;
         if (at == line_end) {
             if (field + 1 < numbers)
-                return std::nullopt;
+                return false;
             break;
         }
         if (*at++ != ':')
-            return std::nullopt;
+            return false;
     }
     m_begin = static_cast<std::size_t>(line_end - m_block.get()) + 1;
-    return std::string_view(start, static_cast<std::size_t>(name_end - start));
+    name = std::string_view(start, static_cast<std::size_t>(name_end - start));
+    return true;
 }
 
-std::optional<std::string_view> AccountLineReader::next_name(std::string& scratch)
+bool AccountLineReader::next_name(std::string& scratch, std::string_view& name)
 {
     for (;;) {
         if (m_fd < 0 || (m_begin == m_end && !refill()))
-            return std::nullopt;
-        if (const auto name = plain_entry_name())
-            return name;
+            return false;
+        if (plain_entry_name(name))
+            return true;
         const auto line = next();
         if (!line)
-            return std::nullopt;
-        if (const auto name = account_entry_name(*line, m_kind, scratch))
-            return name;
+            return false;
+        if (const auto entry = account_entry_name(*line, m_kind, scratch)) {
+            name = *entry;
+            return true;
+        }
     }
 }
 

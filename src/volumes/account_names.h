@@ -47,9 +47,9 @@ public:
     explicit operator bool() const { return m_fd >= 0; }
     // The next line, or its head; nothing at the end of the file.
     std::optional<AccountLine> next();
-    // The name of the next entry, or nothing at the end of the file. The name may
-    // point into `scratch`.
-    std::optional<std::string_view> next_name(std::string& scratch);
+    // Sets `name` to the name of the next entry; false at the end of the file. The
+    // name may point into `scratch`.
+    bool next_name(std::string& scratch, std::string_view& name);
     ~AccountLineReader();
     AccountLineReader(const AccountLineReader&) = delete;
     AccountLineReader& operator=(const AccountLineReader&) = delete;
@@ -59,7 +59,7 @@ private:
     // Keeps the part of a piece of a long line that decides its entry, counting its
     // colons; true once the entry is decided.
     bool keep_head(const char* piece, std::size_t length, std::size_t& colons);
-    std::optional<std::string_view> plain_entry_name();
+    bool plain_entry_name(std::string_view& name);
     int m_fd = -1;
     AccountFile m_kind;
     std::size_t m_colons;       // the colons up to the last field the entry depends on
@@ -79,7 +79,8 @@ bool for_each_account_name(const char* path, AccountFile kind, Visit visit)
     if (!reader)
         return false;
     std::string scratch;
-    while (const auto name = reader.next_name(scratch))
-        visit(*name);
+    std::string_view name;
+    while (reader.next_name(scratch, name))
+        visit(name);
     return true;
 }
