@@ -5,7 +5,11 @@
 #include <cstdint>
 #include <cstring>
 #include <fcntl.h>
+#include <optional>
 #include <unistd.h>
+#if defined(__SSE2__)
+#include <emmintrin.h>
+#endif
 
 namespace {
 
@@ -13,6 +17,73 @@ namespace {
 // enough to stay out of the way of the request's memory: every page of it is a page
 // fault (a dozen microseconds on a small device), worth a few reads.
 constexpr std::size_t kBlockSize = 32 * 1024;
+
+// The first line end in [at, end), or nullptr. An account line is a few dozen
+// characters: looked for sixteen at a time in place, it costs less than the call and
+// set-up of memchr(), which is left the last few.
+const char* find_line_end(const char* at, const char* end)
+{
+#if defined(__SSE2__)
+    const __m128i newline = _mm_set1_epi8('\n');
+    for (; end - at >= 16; at += 16) {
+        const __m128i piece = _mm_loadu_si128(reinterpret_cast<const __m128i*>(at));
+        if (const int hits = _mm_movemask_epi8(_mm_cmpeq_epi8(piece, newline)))
+            return at + __builtin_ctz(static_cast<unsigned>(hits));
+    }
+#endif
+    return static_cast<const char*>(std::memchr(at, '\n', static_cast<std::size_t>(end - at)));
+}
+
+#if defined(__SSE2__)
+// The length of the name of a plain line whose fields lie in its first 32 bytes, which
+// the block holds: the name and password end at colons, then `numbers` fields of one
+// to nine digits each end at a colon, the last one at a colon or the line end
+// (`length` bytes in). Nothing when the bytes do not show such a line, which the
+// character walk then weighs. The bytes of each kind are found as one bit mask.
+std::optional<std::size_t> window_name_length(const char* start, std::size_t length, int numbers)
+{
+    const __m128i low = _mm_loadu_si128(reinterpret_cast<const __m128i*>(start));
+    const __m128i high = _mm_loadu_si128(reinterpret_cast<const __m128i*>(start + 16));
+    const auto mask = [](__m128i hits_low, __m128i hits_high) {
+        return static_cast<std::uint64_t>(static_cast<unsigned>(_mm_movemask_epi8(hits_low))) |
+               static_cast<std::uint64_t>(static_cast<unsigned>(_mm_movemask_epi8(hits_high))) << 16;
+    };
+    const __m128i colon = _mm_set1_epi8(':');
+    // A digit is a byte whose distance above '0' is at most 9.
+    const __m128i zero = _mm_set1_epi8('0');
+    const __m128i nine = _mm_set1_epi8(9);
+    const auto is_digit = [&](__m128i bytes) {
+        const __m128i above = _mm_sub_epi8(bytes, zero);
+        return _mm_cmpeq_epi8(_mm_min_epu8(above, nine), above);
+    };
+    // Only the bytes before the line end belong to the line; past the window nothing is known.
+    const std::uint64_t inside = length >= 32 ? 0xFFFFFFFFu : (std::uint64_t{1} << length) - 1;
+    std::uint64_t colons = mask(_mm_cmpeq_epi8(low, colon), _mm_cmpeq_epi8(high, colon)) & inside;
+    const std::uint64_t other = ~(mask(is_digit(low), is_digit(high)) & inside);
+
+    if (colons == 0)
+        return std::nullopt;
+    const auto name_length = static_cast<std::size_t>(__builtin_ctzll(colons));
+    colons &= colons - 1;
+    if (colons == 0)
+        return std::nullopt;
+    auto at = static_cast<std::size_t>(__builtin_ctzll(colons)) + 1;
+    for (int field = 0; field < numbers; ++field) {
+        if (at >= 32)
+            return std::nullopt;
+        const auto end = static_cast<std::size_t>(__builtin_ctzll(other >> at << at));
+        if (end >= 32 || end == at || end - at > 9)
+            return std::nullopt;
+        const bool last = field + 1 == numbers;
+        if (end == length && last)
+            return name_length;
+        if (end >= length || !(colons >> end & 1))
+            return std::nullopt;
+        at = end + 1;
+    }
+    return name_length;
+}
+#endif
 
 // White space as the C locale's isspace() sees it.
 bool is_blank(char c)
@@ -166,12 +237,23 @@ bool AccountLineReader::plain_entry_name(std::string_view& name)
     if (m_block_holds_nul)
         return false;
     const char* const start = m_block.get() + m_begin;
-    const auto* const line_end = static_cast<const char*>(std::memchr(start, '\n', m_end - m_begin));
+    const char* const line_end = find_line_end(start, m_block.get() + m_end);
     if (!line_end || line_end == start)
         return false;
     const char first = *start;
     if (first == '#' || first == '+' || first == '-' || first == ':' || is_blank(first))
         return false;
+    const int numbers = m_kind == AccountFile::Passwd ? 2 : 1;
+#if defined(__SSE2__)
+    const auto length = static_cast<std::size_t>(line_end - start);
+    if (start + 32 <= m_block.get() + m_end) {
+        if (const auto name_length = window_name_length(start, length, numbers)) {
+            m_begin = static_cast<std::size_t>(line_end - m_block.get()) + 1;
+            name = std::string_view(start, *name_length);
+            return true;
+        }
+    }
+#endif
     const char* at = start;
     while (*at != ':' && *at != '\n')
         ++at;
@@ -182,7 +264,6 @@ bool AccountLineReader::plain_entry_name(std::string_view& name)
         ++at;
     if (at++ == line_end)
         return false;
-    const int numbers = m_kind == AccountFile::Passwd ? 2 : 1;
     for (int field = 0; field < numbers; ++field) {
         // At most nine digits: the value fits 32 bits without a look.
         const char* const digits = at;
