@@ -1,6 +1,7 @@
 #include "account_files.h"
 
 #include <crypt.h>
+#include <cstring>
 #include <ctime>
 #include <unistd.h>
 
@@ -96,10 +97,18 @@ bool member_text_lists(std::string_view text, std::string_view user)
         return false;
     if (user.empty())
         return text.front() == ',' || text.back() == ',' || text.find(",,") != std::string_view::npos;
-    for (std::size_t at = text.find(user); at != std::string_view::npos; at = text.find(user, at + 1)) {
-        const std::size_t end = at + user.size();
-        if ((at == 0 || text[at - 1] == ',') && (end == text.size() || text[end] == ','))
+    // memmem() skips along the text by the name's bytes, where a search for its first
+    // character would stop at every member (they mostly begin alike).
+    const char* const begin = text.data();
+    const char* const end = begin + text.size();
+    for (const char* at = begin; at < end;) {
+        const auto* found = static_cast<const char*>(memmem(at, static_cast<std::size_t>(end - at), user.data(), user.size()));
+        if (!found)
+            return false;
+        const char* const after = found + user.size();
+        if ((found == begin || found[-1] == ',') && (after == end || *after == ','))
             return true;
+        at = found + 1;
     }
     return false;
 }

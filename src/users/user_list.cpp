@@ -2,6 +2,7 @@
 #include <algorithm>
 #include <cstdio>
 #include <cstring>
+#include <memory>
 #include <new>
 #include <string>
 #include <string_view>
@@ -103,44 +104,51 @@ void list_local_users(const FixedText<4>& page, FilteredPageCounter& counter, co
 
 // The names of the user list, '#' after each, kept in blocks that never move: the list
 // of 50,000 users is half a megabyte, which a string grown by doubling would hold one
-// and a half times over while it grows.
+// and a half times over while it grows. A name is copied into its block's free room.
 class NameList {
 public:
     void add(std::string_view name)
     {
-        if (m_blocks.empty() || m_blocks.back().size() + name.size() + 1 > kBlockSize) {
-            m_blocks.emplace_back();
-            m_blocks.back().reserve(std::max(kBlockSize, name.size() + 1));
+        if (m_blocks.empty() || m_blocks.back().used + name.size() + 1 > m_blocks.back().size) {
+            const std::size_t size = std::max(kBlockSize, name.size() + 1);
+            m_blocks.push_back({std::make_unique_for_overwrite<char[]>(size), size, 0});
         }
-        m_blocks.back() += name;
-        m_blocks.back() += '#';
+        Block& block = m_blocks.back();
+        std::memcpy(block.bytes.get() + block.used, name.data(), name.size());
+        block.used += name.size();
+        block.bytes[block.used++] = '#';
     }
 
     // A non-empty list loses its final '#'.
     void drop_final_separator()
     {
         if (!m_blocks.empty())
-            m_blocks.back().pop_back();
+            --m_blocks.back().used;
     }
 
     std::string joined() const
     {
         std::string text;
-        for (const std::string& block : m_blocks)
-            text += block;
+        for (const Block& block : m_blocks)
+            text.append(block.bytes.get(), block.used);
         return text;
     }
 
     // The list goes to the answer as it is, block by block: a name is never a format.
     void write() const
     {
-        for (const std::string& block : m_blocks)
-            std::fwrite(block.data(), 1, block.size(), cgiOut);
+        for (const Block& block : m_blocks)
+            std::fwrite(block.bytes.get(), 1, block.used, cgiOut);
     }
 
 private:
+    struct Block {
+        std::unique_ptr<char[]> bytes;
+        std::size_t size;
+        std::size_t used;
+    };
     static constexpr std::size_t kBlockSize = 64 * 1024;
-    std::vector<std::string> m_blocks;
+    std::vector<Block> m_blocks;
 };
 
 } // namespace
