@@ -23,6 +23,8 @@ constexpr std::size_t kBlockSize = 32 * 1024;
 // set-up of memchr(), which is left the last few.
 const char* find_line_end(const char* at, const char* end)
 {
+    if (at >= end)
+        return nullptr;
 #if defined(__SSE2__)
     const __m128i newline = _mm_set1_epi8('\n');
     for (; end - at >= 16; at += 16) {
@@ -34,53 +36,83 @@ const char* find_line_end(const char* at, const char* end)
     return static_cast<const char*>(std::memchr(at, '\n', static_cast<std::size_t>(end - at)));
 }
 
+// The block is followed by this many zeroed bytes: the first 96 bytes of any line of
+// the block can be looked at in pieces without a bound to check.
+constexpr std::size_t kSlack = 96;
+
 #if defined(__SSE2__)
-// The length of the name of a plain line whose fields lie in its first 32 bytes, which
-// the block holds: the name and password end at colons, then `numbers` fields of one
-// to nine digits each end at a colon, the last one at a colon or the line end
-// (`length` bytes in). Nothing when the bytes do not show such a line, which the
-// character walk then weighs. The bytes of each kind are found as one bit mask.
-std::optional<std::size_t> window_name_length(const char* start, std::size_t length, int numbers)
+// The first 32 bytes of a line as bit masks: its line ends, colons and digits.
+struct LineHead {
+    std::uint32_t line_ends;
+    std::uint32_t colons;
+    std::uint32_t digits;
+};
+
+LineHead look_at_head(const char* start)
 {
     const __m128i low = _mm_loadu_si128(reinterpret_cast<const __m128i*>(start));
     const __m128i high = _mm_loadu_si128(reinterpret_cast<const __m128i*>(start + 16));
-    const auto mask = [](__m128i hits_low, __m128i hits_high) {
-        return static_cast<std::uint64_t>(static_cast<unsigned>(_mm_movemask_epi8(hits_low))) |
-               static_cast<std::uint64_t>(static_cast<unsigned>(_mm_movemask_epi8(hits_high))) << 16;
+    const auto mask = [&](auto hits) {
+        return static_cast<std::uint32_t>(_mm_movemask_epi8(hits(low))) |
+               static_cast<std::uint32_t>(_mm_movemask_epi8(hits(high))) << 16;
     };
-    const __m128i colon = _mm_set1_epi8(':');
+    const auto equal_to = [](char c) {
+        return [c](__m128i bytes) { return _mm_cmpeq_epi8(bytes, _mm_set1_epi8(c)); };
+    };
     // A digit is a byte whose distance above '0' is at most 9.
-    const __m128i zero = _mm_set1_epi8('0');
-    const __m128i nine = _mm_set1_epi8(9);
-    const auto is_digit = [&](__m128i bytes) {
-        const __m128i above = _mm_sub_epi8(bytes, zero);
-        return _mm_cmpeq_epi8(_mm_min_epu8(above, nine), above);
+    const auto is_digit = [](__m128i bytes) {
+        const __m128i above = _mm_sub_epi8(bytes, _mm_set1_epi8('0'));
+        return _mm_cmpeq_epi8(_mm_min_epu8(above, _mm_set1_epi8(9)), above);
     };
-    // Only the bytes before the line end belong to the line; past the window nothing is known.
-    const std::uint64_t inside = length >= 32 ? 0xFFFFFFFFu : (std::uint64_t{1} << length) - 1;
-    std::uint64_t colons = mask(_mm_cmpeq_epi8(low, colon), _mm_cmpeq_epi8(high, colon)) & inside;
-    const std::uint64_t other = ~(mask(is_digit(low), is_digit(high)) & inside);
+    return {mask(equal_to('\n')), mask(equal_to(':')), mask(is_digit)};
+}
 
+// The line ends among the 64 bytes from `at`, as bits: the rest of a line of a hundred
+// bytes in one look, not in a loop whose end the branch predictor cannot guess.
+std::uint64_t line_end_bits(const char* at)
+{
+    std::uint64_t bits = 0;
+    for (int piece = 0; piece < 4; ++piece) {
+        const __m128i bytes = _mm_loadu_si128(reinterpret_cast<const __m128i*>(at + 16 * piece));
+        const int hits = _mm_movemask_epi8(_mm_cmpeq_epi8(bytes, _mm_set1_epi8('\n')));
+        bits |= static_cast<std::uint64_t>(static_cast<unsigned>(hits)) << (16 * piece);
+    }
+    return bits;
+}
+
+// The end of a number field of one to nine digits that begins at `at` (at most 32):
+// the first byte from there that is no digit of the line (`other` has a bit for each
+// such byte, and for every position past the 32 bytes). Nothing when the field is
+// empty, too long, or not known to end within the 32 bytes.
+std::optional<unsigned> number_end(std::uint64_t other, unsigned at)
+{
+    const auto end = static_cast<unsigned>(__builtin_ctzll(other >> at << at));
+    if (end - at - 1 > 8 || end >= 32)
+        return std::nullopt;
+    return end;
+}
+
+// The length of the name of a plain line whose fields lie in its first 32 bytes: the
+// name and password end at colons, then `numbers` fields of one to nine digits each,
+// each but the last ending at a colon, the last at a colon or the line end (`length`
+// bytes in). Nothing when the bytes do not show such a line, which the character walk
+// then weighs.
+std::optional<std::size_t> head_name_length(const LineHead& head, std::size_t length, int numbers)
+{
+    const std::uint32_t inside = length >= 32 ? 0xFFFFFFFFu : (std::uint32_t{1} << length) - 1;
+    std::uint32_t colons = head.colons & inside;
+    const std::uint64_t other = ~static_cast<std::uint64_t>(head.digits & inside);
     if (colons == 0)
         return std::nullopt;
-    const auto name_length = static_cast<std::size_t>(__builtin_ctzll(colons));
+    const auto name_length = static_cast<unsigned>(__builtin_ctz(colons));
     colons &= colons - 1;
     if (colons == 0)
         return std::nullopt;
-    auto at = static_cast<std::size_t>(__builtin_ctzll(colons)) + 1;
-    for (int field = 0; field < numbers; ++field) {
-        if (at >= 32)
-            return std::nullopt;
-        const auto end = static_cast<std::size_t>(__builtin_ctzll(other >> at << at));
-        if (end >= 32 || end == at || end - at > 9)
-            return std::nullopt;
-        const bool last = field + 1 == numbers;
-        if (end == length && last)
-            return name_length;
-        if (end >= length || !(colons >> end & 1))
-            return std::nullopt;
-        at = end + 1;
-    }
+    auto end = number_end(other, static_cast<unsigned>(__builtin_ctz(colons)) + 1);
+    if (end && numbers == 2)
+        end = *end < length && (colons >> *end & 1) ? number_end(other, *end + 1) : std::nullopt;
+    if (!end || (*end != length && (*end > length || !(colons >> *end & 1))))
+        return std::nullopt;
     return name_length;
 }
 #endif
@@ -194,13 +226,14 @@ AccountLineReader::~AccountLineReader()
 bool AccountLineReader::refill()
 {
     if (!m_block)
-        m_block = std::make_unique_for_overwrite<char[]>(kBlockSize);
+        m_block = std::make_unique_for_overwrite<char[]>(kBlockSize + kSlack);
     ssize_t got = 0;
     do
         got = read(m_fd, m_block.get(), kBlockSize);
     while (got < 0 && errno == EINTR);
     m_begin = 0;
     m_end = got > 0 ? static_cast<std::size_t>(got) : 0;
+    std::memset(m_block.get() + m_end, 0, kSlack);
     // One look per block spares one per line: account files hold no NUL.
     m_block_holds_nul = std::memchr(m_block.get(), '\0', m_end) != nullptr;
     return m_end > 0;
@@ -232,27 +265,39 @@ bool AccountLineReader::keep_head(const char* piece, std::size_t length, std::si
 // next() and account_entry_name() then weigh; on such lines both find the same.
 // The fields are short: once the line end is found they are walked a character at a
 // time, and the line end stops every walk.
-bool AccountLineReader::plain_entry_name(std::string_view& name)
+[[gnu::always_inline]] inline bool AccountLineReader::plain_entry_name(std::string_view& name)
 {
     if (m_block_holds_nul)
         return false;
     const char* const start = m_block.get() + m_begin;
-    const char* const line_end = find_line_end(start, m_block.get() + m_end);
-    if (!line_end || line_end == start)
-        return false;
+    const char* const block_end = m_block.get() + m_end;
     const char first = *start;
+    // A line end is white space too: an empty line is no plain one.
     if (first == '#' || first == '+' || first == '-' || first == ':' || is_blank(first))
         return false;
     const int numbers = m_kind == AccountFile::Passwd ? 2 : 1;
 #if defined(__SSE2__)
-    const auto length = static_cast<std::size_t>(line_end - start);
-    if (start + 32 <= m_block.get() + m_end) {
-        if (const auto name_length = window_name_length(start, length, numbers)) {
-            m_begin = static_cast<std::size_t>(line_end - m_block.get()) + 1;
-            name = std::string_view(start, *name_length);
-            return true;
-        }
+    // The block's slack is no line end, colon or digit: the look may reach into it.
+    const LineHead head = look_at_head(start);
+    const char* line_end = nullptr;
+    if (head.line_ends != 0) {
+        line_end = start + __builtin_ctz(head.line_ends);
+    } else if (const std::uint64_t rest = line_end_bits(start + 32)) {
+        line_end = start + 32 + __builtin_ctzll(rest);
+    } else {
+        line_end = find_line_end(start + 96, block_end);
+        if (!line_end)
+            return false;
     }
+    if (const auto name_length = head_name_length(head, static_cast<std::size_t>(line_end - start), numbers)) {
+        m_begin = static_cast<std::size_t>(line_end - m_block.get()) + 1;
+        name = std::string_view(start, *name_length);
+        return true;
+    }
+#else
+    const char* const line_end = find_line_end(start, block_end);
+    if (!line_end)
+        return false;
 #endif
     const char* at = start;
     while (*at != ':' && *at != '\n')

@@ -63,7 +63,9 @@ private:
     int m_fd = -1;
     AccountFile m_kind;
     std::size_t m_colons;       // the colons up to the last field the entry depends on
-    std::unique_ptr<char[]> m_block;    // kBlockSize bytes, never cleared: read() fills them
+    // kBlockSize bytes that read() fills, never cleared, then a few zeroed ones after the
+    // bytes read, so that a line's first bytes are looked at without a bound to check
+    std::unique_ptr<char[]> m_block;
     std::size_t m_begin = 0;
     std::size_t m_end = 0;
     bool m_block_holds_nul = false;
