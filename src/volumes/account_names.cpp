@@ -71,13 +71,12 @@ LineHead look_at_head(const char* start)
 // bytes in one look, not in a loop whose end the branch predictor cannot guess.
 std::uint64_t line_end_bits(const char* at)
 {
-    std::uint64_t bits = 0;
-    for (int piece = 0; piece < 4; ++piece) {
-        const __m128i bytes = _mm_loadu_si128(reinterpret_cast<const __m128i*>(at + 16 * piece));
+    const auto piece = [at](int index) {
+        const __m128i bytes = _mm_loadu_si128(reinterpret_cast<const __m128i*>(at + 16 * index));
         const int hits = _mm_movemask_epi8(_mm_cmpeq_epi8(bytes, _mm_set1_epi8('\n')));
-        bits |= static_cast<std::uint64_t>(static_cast<unsigned>(hits)) << (16 * piece);
-    }
-    return bits;
+        return static_cast<std::uint64_t>(static_cast<unsigned>(hits)) << (16 * index);
+    };
+    return piece(0) | piece(1) | piece(2) | piece(3);
 }
 
 // The end of a number field of one to nine digits that begins at `at` (at most 32):
@@ -329,21 +328,29 @@ bool AccountLineReader::keep_head(const char* piece, std::size_t length, std::si
     return true;
 }
 
-bool AccountLineReader::next_name(std::string& scratch, std::string_view& name)
+std::size_t AccountLineReader::next_names(std::span<std::string_view> names, std::string& scratch)
 {
-    for (;;) {
-        if (m_fd < 0 || (m_begin == m_end && !refill()))
-            return false;
-        if (plain_entry_name(name))
-            return true;
+    std::size_t count = 0;
+    while (count < names.size() && m_fd >= 0) {
+        // The names taken so far point into the block: the next block waits for the next call.
+        if (m_begin == m_end && (count > 0 || !refill()))
+            break;
+        if (plain_entry_name(names[count])) {
+            ++count;
+            continue;
+        }
+        // Any other line may need `scratch` or the next blocks: it ends the batch.
+        if (count > 0)
+            break;
         const auto line = next();
         if (!line)
-            return false;
+            break;
         if (const auto entry = account_entry_name(*line, m_kind, scratch)) {
-            name = *entry;
-            return true;
+            names[count++] = *entry;
+            break;
         }
     }
+    return count;
 }
 
 std::optional<AccountLine> AccountLineReader::next()
