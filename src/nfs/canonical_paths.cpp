@@ -44,17 +44,6 @@ bool is_plain(std::string_view text)
     return true;
 }
 
-std::string joined(std::string_view dir, std::string_view name)
-{
-    std::string path;
-    path.reserve(dir.size() + 1 + name.size());
-    path += dir;
-    if (dir != "/")
-        path += '/';
-    path += name;
-    return path;
-}
-
 struct DirectoryCloser {
     void operator()(DIR* directory) const { closedir(directory); }
 };
@@ -96,15 +85,21 @@ constexpr CanonicalStep kLoop{std::nullopt, kMostLinks + 1, false};
 struct Stepper {
     std::unordered_map<std::string, CanonicalStep>& steps;
     std::unordered_map<std::string, DirectoryListing>& listings;
+    std::string& key;                       // the look-up text of a step, reused
     std::vector<std::string> following;     // the links being followed, innermost last
 
     // The step into `name` inside the canonical directory `dir`, remembered unless it
-    // depends on the links being followed.
+    // depends on the links being followed. The steps stay where they are in the map,
+    // so a walk goes on from the path a step holds, without a copy.
     const CanonicalStep& step(const std::string& dir, std::string_view name)
     {
-        std::string path = joined(dir, name);
-        if (const auto known = steps.find(path); known != steps.end())
+        key.assign(dir);
+        if (dir != "/")
+            key += '/';
+        key += name;
+        if (const auto known = steps.find(key); known != steps.end())
             return known->second;
+        std::string path = key;
         if (path.size() >= kLongestPath)
             return kUndecided;
         if (std::find(following.begin(), following.end(), path) != following.end())
@@ -115,7 +110,8 @@ struct Stepper {
             return steps.emplace(std::move(path), std::move(*listed)).first->second;
 
         CanonicalStep outcome;
-        std::array<char, PATH_MAX> target{};
+        // Only the `length` bytes that readlink() writes are read.
+        std::array<char, PATH_MAX> target;
         const ssize_t length = readlink(path.c_str(), target.data(), target.size() - 1);
         if (length < 0) {
             // Not a link, so the component is there; any other failure ends the walk.
@@ -142,7 +138,9 @@ struct Stepper {
     {
         if (!is_plain(text))
             return kUndecided;
-        CanonicalStep outcome{std::string(start), 0, false};
+        const std::string start_dir(start);
+        const std::string* dir = &start_dir;
+        int links = 0;
         std::size_t begin = 0;
         while (begin < text.size()) {
             const auto end = std::min(text.find('/', begin), text.size());
@@ -150,15 +148,15 @@ struct Stepper {
             begin = end + 1;
             if (name.empty())
                 continue;
-            const CanonicalStep& next = step(*outcome.path, name);
+            const CanonicalStep& next = step(*dir, name);
             if (next.undecided)
                 return next;
-            outcome.links += next.links;
-            outcome.path = next.path;
-            if (!outcome.path || outcome.links > kMostLinks)
-                return {std::nullopt, outcome.links, false};
+            links += next.links;
+            if (!next.path || links > kMostLinks)
+                return {std::nullopt, links, false};
+            dir = &*next.path;
         }
-        return outcome;
+        return {*dir, links, false};
     }
 };
 
@@ -170,7 +168,7 @@ const std::optional<std::string>& CanonicalPaths::of(const std::string& path)
     if (!inserted)
         return place->second;
     if (!path.empty() && path[0] == '/') {
-        Stepper stepper{m_steps, m_listings, {}};
+        Stepper stepper{m_steps, m_listings, m_key, {}};
         const CanonicalStep outcome = stepper.walk("/", path);
         if (!outcome.undecided) {
             place->second = outcome.path;
