@@ -41,6 +41,22 @@ std::string repeated(const std::string& piece, int times)
     return text;
 }
 
+// Well-formed lines of 9 to 160 bytes, with numbers of one to ten digits, the gid
+// sometimes last on its line: their ends fall at every distance from the first bytes
+// that are looked at together, and across the ends of the reader's blocks.
+std::string plain_lines()
+{
+    std::string text;
+    for (int n = 0; text.size() < 100000; ++n) {
+        const std::string number(static_cast<std::size_t>(1 + n % 10), static_cast<char>('1' + n % 9));
+        text += "u" + std::to_string(n) + ":x:" + number + ":" + number;
+        if (n % 7 != 0)
+            text += ":" + std::string(static_cast<std::size_t>(n % 140), 'g');
+        text += '\n';
+    }
+    return text;
+}
+
 } // namespace
 
 TEST(AccountNames, FindTheEntriesOfOddAndRandomLinesAsTheLibraryDoes)
@@ -66,6 +82,7 @@ TEST(AccountNames, FindTheEntriesOfOddAndRandomLinesAsTheLibraryDoes)
         {"decided only past a block", std::string(70000, 'n') + ":x:" + std::string(70000, ' ') + "12:13:\n"},
         {"NUL past a block", std::string(70000, 'n') + std::string(1, '\0') + ":x:1:1\nz:x:1:2\n"},
         {"long last line", "a:x:1:2\n" + std::string(100000, 'b')},
+        {"plain lines of every length across block ends", plain_lines()},
     };
     for (const auto& [what, content] : cases)
         expect_same_names(content, what);
