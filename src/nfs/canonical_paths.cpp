@@ -85,8 +85,8 @@ constexpr CanonicalStep kLoop{std::nullopt, kMostLinks + 1, false};
 struct Stepper {
     std::unordered_map<std::string, CanonicalStep>& steps;
     std::unordered_map<std::string, DirectoryListing>& listings;
-    std::string& key;                       // the look-up text of a step, reused
     std::vector<std::string> following;     // the links being followed, innermost last
+    std::string key;                        // the look-up text of a step, reused
 
     // The step into `name` inside the canonical directory `dir`, remembered unless it
     // depends on the links being followed. The steps stay where they are in the map,
@@ -168,7 +168,7 @@ const std::optional<std::string>& CanonicalPaths::of(const std::string& path)
     if (!inserted)
         return place->second;
     if (!path.empty() && path[0] == '/') {
-        Stepper stepper{m_steps, m_listings, m_key, {}};
+        Stepper stepper{m_steps, m_listings, {}, {}};
         const CanonicalStep outcome = stepper.walk("/", path);
         if (!outcome.undecided) {
             place->second = outcome.path;

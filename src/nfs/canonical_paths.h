@@ -35,5 +35,4 @@ private:
     std::unordered_map<std::string, std::optional<std::string>> m_paths;    // whole texts
     std::unordered_map<std::string, CanonicalStep> m_steps;                 // "dir/name"
     std::unordered_map<std::string, DirectoryListing> m_listings;           // canonical directories
-    std::string m_key;
 };

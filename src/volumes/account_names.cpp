@@ -328,29 +328,21 @@ bool AccountLineReader::keep_head(const char* piece, std::size_t length, std::si
     return true;
 }
 
-std::size_t AccountLineReader::next_names(std::span<std::string_view> names, std::string& scratch)
+bool AccountLineReader::next_name(std::string& scratch, std::string_view& name)
 {
-    std::size_t count = 0;
-    while (count < names.size() && m_fd >= 0) {
-        // The names taken so far point into the block: the next block waits for the next call.
-        if (m_begin == m_end && (count > 0 || !refill()))
-            break;
-        if (plain_entry_name(names[count])) {
-            ++count;
-            continue;
-        }
-        // Any other line may need `scratch` or the next blocks: it ends the batch.
-        if (count > 0)
-            break;
+    for (;;) {
+        if (m_fd < 0 || (m_begin == m_end && !refill()))
+            return false;
+        if (plain_entry_name(name))
+            return true;
         const auto line = next();
         if (!line)
-            break;
+            return false;
         if (const auto entry = account_entry_name(*line, m_kind, scratch)) {
-            names[count++] = *entry;
-            break;
+            name = *entry;
+            return true;
         }
     }
-    return count;
 }
 
 std::optional<AccountLine> AccountLineReader::next()

@@ -14,11 +14,9 @@
 // alone on its line. The name is the text before the first ":".
 #pragma once
 
-#include <array>
 #include <cstddef>
 #include <memory>
 #include <optional>
-#include <span>
 #include <string>
 #include <string_view>
 
@@ -49,10 +47,9 @@ public:
     explicit operator bool() const { return m_fd >= 0; }
     // The next line, or its head; nothing at the end of the file.
     std::optional<AccountLine> next();
-    // Fills `names` with the names of the next entries, as many as it holds or as one
-    // block gives, and tells how many; 0 at the end of the file. The names stay valid
-    // until the next call, and may point into `scratch`.
-    std::size_t next_names(std::span<std::string_view> names, std::string& scratch);
+    // Sets `name` to the name of the next entry; false at the end of the file. The
+    // name may point into `scratch`.
+    bool next_name(std::string& scratch, std::string_view& name);
     ~AccountLineReader();
     AccountLineReader(const AccountLineReader&) = delete;
     AccountLineReader& operator=(const AccountLineReader&) = delete;
@@ -84,11 +81,8 @@ bool for_each_account_name(const char* path, AccountFile kind, Visit visit)
     if (!reader)
         return false;
     std::string scratch;
-    // Taken a block's worth at a time: a call per entry costs more than the look at it.
-    std::array<std::string_view, 64> names;
-    while (const std::size_t count = reader.next_names(names, scratch)) {
-        for (std::size_t i = 0; i < count; ++i)
-            visit(names[i]);
-    }
+    std::string_view name;
+    while (reader.next_name(scratch, name))
+        visit(name);
     return true;
 }
