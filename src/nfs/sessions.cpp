@@ -1,11 +1,13 @@
 // The per-share overview: which file services are on, and for every share its name,
 // its path and the NFS rule that "/etc/exports" holds for it.
+#include <algorithm>
 #include <cstdio>
 #include <cstring>
 #include <optional>
 #include <string>
 #include <string_view>
 #include <unordered_map>
+#include <vector>
 
 #include "cgi/fixed_text.h"
 #include "cgi/handlers.h"
@@ -44,13 +46,39 @@ void report_rule(const exports_entry& record, RuleTexts& texts)
     texts.host.assign(record.ip.view());
 }
 
+// Whether a rule can be found by one of the share paths: only through its written text
+// (when that does not resolve) or, when it resolves, through the 8 characters it is
+// then compared as. A rule that can be found by neither need not be resolved at all:
+// its links are not read.
+class SharePaths {
+public:
+    explicit SharePaths(const share_info* shares)
+    {
+        for (const share_info* share = shares; share != nullptr; share = share->next) {
+            m_paths.emplace_back(share->path);
+            if (m_paths.back().size() <= 8)
+                m_has_short_path = true;
+        }
+        std::sort(m_paths.begin(), m_paths.end());
+    }
+
+    bool can_find(const exports_entry& record) const
+    {
+        return m_has_short_path || std::binary_search(m_paths.begin(), m_paths.end(), record.volume.view());
+    }
+
+private:
+    std::vector<std::string_view> m_paths;     // into the share records, sorted
+    bool m_has_short_path = false;
+};
+
 // "/etc/exports" as every share's look-up sees it. Without the debug trace the file is
 // parsed once per request and its rules are found by their compared text; with the
 // trace each look-up parses the file and examines every rule again, so that the trace
 // tells the same story per share as it always has.
 class ExportRules {
 public:
-    explicit ExportRules(bool tracing) : m_tracing(tracing)
+    ExportRules(bool tracing, const share_info* shares) : m_tracing(tracing)
     {
         if (m_tracing)
             return;
@@ -61,8 +89,11 @@ public:
         if (m_records < 2)
             return;
         // The last rule of a text wins, as the examination in file order leaves it.
-        for (const exports_entry* record = m_list->next.get(); record != nullptr; record = record->next.get())
-            m_last_of[compared_text(*record, m_resolved_paths)] = record;
+        const SharePaths share_paths(shares);
+        for (const exports_entry* record = m_list->next.get(); record != nullptr; record = record->next.get()) {
+            if (share_paths.can_find(*record))
+                m_last_of[compared_text(*record, m_resolved_paths)] = record;
+        }
     }
 
     // 1 when "/etc/exports" holds a rule for the share path (the last matching rule
@@ -149,7 +180,7 @@ void cgi_get_all_session()
     out("<media_serving>%s</media_serving>", media.c_str());
     out("<webdav_server>%d</webdav_server>", xml_get_int("/system_mgr/webdav/enable") == 1 ? 1 : 0);
 
-    ExportRules rules(trace_enabled());
+    ExportRules rules(trace_enabled(), pss);
     int total = 0;
     for (const share_info* share = pss; share != nullptr; share = share->next) {
         out("<share><name>");
