@@ -63,7 +63,7 @@ FixedText<64> first_volume_base_path(FILE* table)
 
 void create_user_home_share(const char* user, const char* password_flag)
 {
-    const UniqueFile table = open_file(kSharedNameFile, "r");
+    const UniqueFile table = open_volume_table();
     if (!table)
         return;
     const FixedText<64> base = first_volume_base_path(table.get());

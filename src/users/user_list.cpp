@@ -215,7 +215,7 @@ void cgi_get_user_info()
     out("<hddnum>%d</hddnum>", volumes);
     out("<hddsize>%s</hddsize>", sizes.c_str());
 
-    if (const UniqueFile table = open_file(kSharedNameFile, "r")) {
+    if (const UniqueFile table = open_volume_table()) {
         // Lines are read in 64-byte pieces; the fields keep their text from the
         // piece before when a piece does not split.
         FixedText<64> line;

@@ -12,7 +12,7 @@
 
 bool for_each_internal_volume(const std::function<void(const VolumeLine&)>& visit, SplitBuffers buffers)
 {
-    const UniqueFile table = open_file(kSharedNameFile, "r");
+    const UniqueFile table = open_volume_table();
     if (!table)
         return false;
 

@@ -1,5 +1,6 @@
 #include "volumes/volume_table.h"
 
+#include <array>
 #include <cinttypes>
 #include <cstdio>
 #include <cstring>
@@ -10,6 +11,28 @@
 #include "platform/quota.h"
 
 namespace {
+
+struct TableCopy {
+    bool readable = false;
+    std::string text;
+};
+
+const TableCopy& table_copy()
+{
+    static const TableCopy copy = [] {
+        TableCopy read;
+        const UniqueFile file = open_file(kSharedNameFile, "r");
+        if (!file)
+            return read;
+        read.readable = true;
+        std::array<char, 4096> piece;
+        std::size_t length = 0;
+        while ((length = std::fread(piece.data(), 1, piece.size(), file.get())) > 0)
+            read.text.append(piece.data(), length);
+        return read;
+    }();
+    return copy;
+}
 
 // The line without its last character: its newline, or a real character when the
 // table's last line has none. Both readers drop it unconditionally.
@@ -40,6 +63,15 @@ void copy_bounded(char* result, std::size_t result_size, std::string_view text)
 
 } // namespace
 
+UniqueFile open_volume_table()
+{
+    const TableCopy& copy = table_copy();
+    if (!copy.readable)
+        return {};
+    // A stream opened for reading only never writes to its buffer.
+    return UniqueFile(fmemopen(const_cast<char*>(copy.text.data()), copy.text.size(), "r"));
+}
+
 void resolve_volume_path(const char* source, char* result, std::size_t result_size, int mode)
 {
     FixedText<4096> name(source);
@@ -49,7 +81,7 @@ void resolve_volume_path(const char* source, char* result, std::size_t result_si
         *slash = '\0';
     }
 
-    const UniqueFile table = open_file(kSharedNameFile, "r");
+    const UniqueFile table = open_volume_table();
     if (!table) {
         std::fputs("open file error \n", stdout);
         return;
@@ -85,7 +117,7 @@ void resolve_volume_path(const char* source, char* result, std::size_t result_si
 
 void list_volume_sizes(FixedText<256>& result)
 {
-    const UniqueFile table = open_file(kSharedNameFile, "r");
+    const UniqueFile table = open_volume_table();
     if (!table) {
         result.assign("null,null,null,null");
         return;
@@ -111,7 +143,7 @@ void list_volume_sizes(FixedText<256>& result)
 
 int count_volumes()
 {
-    const UniqueFile table = open_file(kSharedNameFile, "r");
+    const UniqueFile table = open_volume_table();
     if (!table)
         return 0;
     int count = 0;

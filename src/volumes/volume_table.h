@@ -3,9 +3,15 @@
 
 #include <cstddef>
 
+#include "cgi/file.h"
 #include "cgi/fixed_text.h"
 
 inline constexpr const char* kSharedNameFile = "/etc/shared_name";
+
+// The table for reading, as it was when this process first read it: the program never
+// writes it, so a request reads the file once however many of its steps look at the
+// volumes, and all of them see the same table. Nothing when the file cannot be read.
+UniqueFile open_volume_table();
 
 // Translates a volume-relative path such as "Volume_1/public" into "/mnt/HD/HD_a2/public"
 // (mode not 0), or into the volume name column (mode 0). An unknown volume gives "null";
