@@ -49,6 +49,14 @@ std::optional<unsigned long long> next_number(std::string_view& rest)
     return value;
 }
 
+// The description of the disks, read once per process: nothing changes it while a
+// request runs, and a request asks for the size of every volume in turn.
+const std::string& disk_list()
+{
+    static const std::string disks = read_text("/sim/disks");
+    return disks;
+}
+
 } // namespace
 
 extern "C" int LIB_Get_Disk_Size(const char* mount_path, unsigned long long* total,
@@ -56,7 +64,7 @@ extern "C" int LIB_Get_Disk_Size(const char* mount_path, unsigned long long* tot
 {
     journal_record("LIB_Get_Disk_Size", {mount_path});
     int result = -1;
-    for_each_line(read_text("/sim/disks"), [&](std::string_view rest) {
+    for_each_line(disk_list(), [&](std::string_view rest) {
         if (result == 0)
             return;
         const auto path = next_word(rest);
