@@ -97,20 +97,23 @@ bool member_text_lists(std::string_view text, std::string_view user)
         return false;
     if (user.empty())
         return text.front() == ',' || text.back() == ',' || text.find(",,") != std::string_view::npos;
-    // memmem() skips along the text by the name's bytes, where a search for its first
-    // character would stop at every member (they mostly begin alike).
-    const char* const begin = text.data();
-    const char* const end = begin + text.size();
-    for (const char* at = begin; at < end;) {
-        const auto* found = static_cast<const char*>(memmem(at, static_cast<std::size_t>(end - at), user.data(), user.size()));
-        if (!found)
-            return false;
-        const char* const after = found + user.size();
-        if ((found == begin || found[-1] == ',') && (after == end || *after == ','))
-            return true;
-        at = found + 1;
-    }
-    return false;
+    // A member is the whole text, or stands at its start before a comma, at its end
+    // after one, or between two. The last is looked for with the commas in the needle:
+    // memmem() skips along the text by the needle's last bytes, and ",NAME," ends in a
+    // pair that the other members' names seldom hold.
+    if (text == user)
+        return true;
+    if (text.size() <= user.size())
+        return false;
+    if ((text.starts_with(user) && text[user.size()] == ',') ||
+        (text.ends_with(user) && text[text.size() - user.size() - 1] == ','))
+        return true;
+    std::string needle;
+    needle.reserve(user.size() + 2);
+    needle += ',';
+    needle += user;
+    needle += ',';
+    return memmem(text.data(), text.size(), needle.data(), needle.size()) != nullptr;
 }
 
 std::string joined_groups(const ColonFile& groups, std::string_view user)
