@@ -1,10 +1,10 @@
 #include "account_files.h"
 
-#include <crypt.h>
 #include <cstring>
 #include <ctime>
 #include <unistd.h>
 
+#include "cgi/crypt_library.h"
 #include "text_file.h"
 
 ColonFile ColonFile::load(const char* path)
@@ -130,10 +130,10 @@ std::string hash_password(const std::string& password)
 {
     if (password.empty())
         return {};
-    const char* salt = crypt_gensalt("$6$", 0, nullptr, 0);
+    const char* salt = libcrypt::crypt_gensalt("$6$", 0);
     if (!salt)
         return {};
-    const char* hash = crypt(password.c_str(), salt);
+    const char* hash = libcrypt::crypt(password.c_str(), salt);
     return hash && hash[0] != '*' ? std::string(hash) : std::string();
 }
 

@@ -2,9 +2,9 @@
 
 #include <cstdio>
 #include <cstring>
-#include <crypt.h>
 #include <string>
 
+#include "cgi/crypt_library.h"
 #include "cgi/event_log.h"
 #include "cgi/file.h"
 #include "cgi/shell.h"
@@ -89,7 +89,7 @@ FixedText<256> shadow_hash(const FixedText<256>& candidate, const char* stored)
 {
     if (std::strncmp(stored, "$2$", 3) == 0)
         return sha1_block_digest(candidate);
-    const char* hash = crypt(candidate.c_str(), stored);
+    const char* hash = libcrypt::crypt(candidate.c_str(), stored);
     return FixedText<256>(hash ? hash : "");
 }
 
