@@ -2,8 +2,8 @@
 // its start. The program and the platform library start once per request and most
 // requests never hash: linked in, libcrypt's calls into the C library are bound at every
 // start (it calls them through its own table, never lazily) and its pages are mapped,
-// about 3 % of a short request; opened on first use it costs a hashing request some
-// 150 microseconds beside the milliseconds the hash itself takes.
+// about 3 % of a short request; opened on first use it costs a hashing request about
+// 200 microseconds beside the milliseconds the hash itself takes.
 #pragma once
 
 namespace libcrypt {

@@ -1,35 +1,26 @@
 #include "volumes/volume_table.h"
 
-#include <array>
 #include <cinttypes>
 #include <cstdio>
 #include <cstring>
+#include <optional>
 #include <string>
 #include <string_view>
 
+#include "cgi/atomic_file.h"
 #include "cgi/file.h"
 #include "platform/quota.h"
 
 namespace {
 
-struct TableCopy {
-    bool readable = false;
-    std::string text;
-};
-
-const TableCopy& table_copy()
+// The table as this process first read it; nothing when it could not be read.
+const std::optional<std::string>& table_copy()
 {
-    static const TableCopy copy = [] {
-        TableCopy read;
-        const UniqueFile file = open_file(kSharedNameFile, "r");
-        if (!file)
-            return read;
-        read.readable = true;
-        std::array<char, 4096> piece;
-        std::size_t length = 0;
-        while ((length = std::fread(piece.data(), 1, piece.size(), file.get())) > 0)
-            read.text.append(piece.data(), length);
-        return read;
+    static const std::optional<std::string> copy = []() -> std::optional<std::string> {
+        std::string text;
+        if (!read_whole_file(kSharedNameFile, text))
+            return std::nullopt;
+        return text;
     }();
     return copy;
 }
@@ -65,11 +56,11 @@ void copy_bounded(char* result, std::size_t result_size, std::string_view text)
 
 UniqueFile open_volume_table()
 {
-    const TableCopy& copy = table_copy();
-    if (!copy.readable)
+    const std::optional<std::string>& copy = table_copy();
+    if (!copy)
         return {};
     // A stream opened for reading only never writes to its buffer.
-    return UniqueFile(fmemopen(const_cast<char*>(copy.text.data()), copy.text.size(), "r"));
+    return UniqueFile(fmemopen(const_cast<char*>(copy->data()), copy->size(), "r"));
 }
 
 void resolve_volume_path(const char* source, char* result, std::size_t result_size, int mode)
