@@ -48,7 +48,7 @@ struct LineHead {
     std::uint32_t digits;
 };
 
-LineHead look_at_head(const char* start)
+[[gnu::always_inline]] inline LineHead look_at_head(const char* start)
 {
     const __m128i low = _mm_loadu_si128(reinterpret_cast<const __m128i*>(start));
     const __m128i high = _mm_loadu_si128(reinterpret_cast<const __m128i*>(start + 16));
@@ -69,7 +69,7 @@ LineHead look_at_head(const char* start)
 
 // The line ends among the 64 bytes from `at`, as bits: the rest of a line of a hundred
 // bytes in one look, not in a loop whose end the branch predictor cannot guess.
-std::uint64_t line_end_bits(const char* at)
+[[gnu::always_inline]] inline std::uint64_t line_end_bits(const char* at)
 {
     const auto piece = [at](int index) {
         const __m128i bytes = _mm_loadu_si128(reinterpret_cast<const __m128i*>(at + 16 * index));
@@ -79,40 +79,45 @@ std::uint64_t line_end_bits(const char* at)
     return piece(0) | piece(1) | piece(2) | piece(3);
 }
 
-// The end of a number field of one to nine digits that begins at `at` (at most 32):
-// the first byte from there that is no digit of the line (`other` has a bit for each
-// such byte, and for every position past the 32 bytes). Nothing when the field is
-// empty, too long, or not known to end within the 32 bytes.
-std::optional<unsigned> number_end(std::uint64_t other, unsigned at)
-{
-    const auto end = static_cast<unsigned>(__builtin_ctzll(other >> at << at));
-    if (end - at - 1 > 8 || end >= 32)
-        return std::nullopt;
-    return end;
-}
-
 // The length of the name of a plain line whose fields lie in its first 32 bytes: the
-// name and password end at colons, then `numbers` fields of one to nine digits each,
-// each but the last ending at a colon, the last at a colon or the line end (`length`
-// bytes in). Nothing when the bytes do not show such a line, which the character walk
-// then weighs.
-std::optional<std::size_t> head_name_length(const LineHead& head, std::size_t length, int numbers)
+// name and password end at colons, then `Numbers` fields of one to nine digits each,
+// each but the last ending at a colon, the last at a colon or at a line end among the
+// 32 bytes. Nothing when the bytes do not show such a line, which the character walk
+// then weighs. The fields are found by their colons and checked all at once, without
+// a branch per field.
+template <int Numbers>
+[[gnu::always_inline]] inline std::optional<std::size_t> head_name_length(const LineHead& head)
 {
-    const std::uint32_t inside = length >= 32 ? 0xFFFFFFFFu : (std::uint32_t{1} << length) - 1;
-    std::uint32_t colons = head.colons & inside;
-    const std::uint64_t other = ~static_cast<std::uint64_t>(head.digits & inside);
-    if (colons == 0)
+    // The bytes up to the line end when it lies among the 32, else all of them.
+    const std::uint32_t inside = head.line_ends ^ (head.line_ends - 1);
+    // The colons of the line, taken in turn; bit 63 stands for "no further colon".
+    constexpr std::uint64_t kNone = std::uint64_t{1} << 63;
+    std::uint64_t colons = (head.colons & inside) | kNone;
+    const auto take = [&colons] {
+        const auto at = static_cast<unsigned>(__builtin_ctzll(colons));
+        colons = (colons & (colons - 1)) | kNone;
+        return at;
+    };
+    const unsigned name_end = take();
+    const unsigned password_end = take();
+    // The colon between the uid and the gid of a password line.
+    const unsigned separator = Numbers == 2 ? take() : password_end;
+    unsigned last_end = take();
+    if (last_end == 63) {
+        if (head.line_ends == 0)
+            return std::nullopt;
+        last_end = static_cast<unsigned>(__builtin_ctz(head.line_ends));
+    }
+    const unsigned first_length = (Numbers == 2 ? separator : last_end) - password_end - 1;
+    const unsigned last_length = last_end - separator - 1;
+    // Every byte of the number fields is a digit.
+    std::uint64_t fields = (std::uint64_t{1} << last_end) - (std::uint64_t{2} << password_end);
+    if constexpr (Numbers == 2)
+        fields &= ~(std::uint64_t{1} << separator);
+    const bool digits = (fields & ~static_cast<std::uint64_t>(head.digits)) == 0;
+    if (!digits | (first_length - 1 > 8) | (last_length - 1 > 8))
         return std::nullopt;
-    const auto name_length = static_cast<unsigned>(__builtin_ctz(colons));
-    colons &= colons - 1;
-    if (colons == 0)
-        return std::nullopt;
-    auto end = number_end(other, static_cast<unsigned>(__builtin_ctz(colons)) + 1);
-    if (end && numbers == 2)
-        end = *end < length && (colons >> *end & 1) ? number_end(other, *end + 1) : std::nullopt;
-    if (!end || (*end != length && (*end > length || !(colons >> *end & 1))))
-        return std::nullopt;
-    return name_length;
+    return name_end;
 }
 #endif
 
@@ -258,89 +263,123 @@ bool AccountLineReader::keep_head(const char* piece, std::size_t length, std::si
     return nul != nullptr;
 }
 
-// The name of a well-formed line that lies whole in the block: a name that begins with
-// none of the characters the readers treat apart, a password field, numbers of a few
-// digits each, a line end. False, with the line left unread, for any other line, which
-// next() and account_entry_name() then weigh; on such lines both find the same.
-// The fields are short: once the line end is found they are walked a character at a
-// time, and the line end stops every walk.
-[[gnu::always_inline]] inline bool AccountLineReader::plain_entry_name(std::string_view& name)
+namespace {
+
+// The length of the name of a well-formed line, walked a character at a time: a
+// password field, numbers of a few digits each, the line end at `line_end`. The line
+// end stops every walk.
+std::optional<std::size_t> walked_name_length(const char* start, const char* line_end, int numbers)
 {
-    if (m_block_holds_nul)
-        return false;
-    const char* const start = m_block.get() + m_begin;
-    const char* const block_end = m_block.get() + m_end;
-    const char first = *start;
-    // A line end is white space too: an empty line is no plain one.
-    if (first == '#' || first == '+' || first == '-' || first == ':' || is_blank(first))
-        return false;
-    const int numbers = m_kind == AccountFile::Passwd ? 2 : 1;
-#if defined(__SSE2__)
-    // The block's slack is no line end, colon or digit: the look may reach into it.
-    const LineHead head = look_at_head(start);
-    const char* line_end = nullptr;
-    if (head.line_ends != 0) {
-        line_end = start + __builtin_ctz(head.line_ends);
-    } else if (const std::uint64_t rest = line_end_bits(start + 32)) {
-        line_end = start + 32 + __builtin_ctzll(rest);
-    } else {
-        line_end = find_line_end(start + 96, block_end);
-        if (!line_end)
-            return false;
-    }
-    if (const auto name_length = head_name_length(head, static_cast<std::size_t>(line_end - start), numbers)) {
-        m_begin = static_cast<std::size_t>(line_end - m_block.get()) + 1;
-        name = std::string_view(start, *name_length);
-        return true;
-    }
-#else
-    const char* const line_end = find_line_end(start, block_end);
-    if (!line_end)
-        return false;
-#endif
     const char* at = start;
     while (*at != ':' && *at != '\n')
         ++at;
     if (at == line_end)
-        return false;
+        return std::nullopt;
     const char* const name_end = at++;
     while (*at != ':' && *at != '\n')
         ++at;
     if (at++ == line_end)
-        return false;
+        return std::nullopt;
     for (int field = 0; field < numbers; ++field) {
         // At most nine digits: the value fits 32 bits without a look.
         const char* const digits = at;
         while (static_cast<unsigned char>(*at - '0') < 10)
             ++at;
         if (at == digits || at - digits > 9)
-            return false;
+            return std::nullopt;
         if (at == line_end) {
             if (field + 1 < numbers)
-                return false;
+                return std::nullopt;
             break;
         }
         if (*at++ != ':')
-            return false;
+            return std::nullopt;
     }
-    m_begin = static_cast<std::size_t>(line_end - m_block.get()) + 1;
-    name = std::string_view(start, static_cast<std::size_t>(name_end - start));
-    return true;
+    return static_cast<std::size_t>(name_end - start);
 }
 
-bool AccountLineReader::next_name(std::string& scratch, std::string_view& name)
+// The names of the well-formed lines that lie whole in the block from `begin` on, until
+// `names` is full or a line is not one: a name that begins with none of the characters
+// the readers treat apart, a password field, `Numbers` numbers of a few digits each, a
+// line end. `begin` is left at the first other line, for next() and
+// account_entry_name() to weigh; on well-formed lines both find the same.
+template <int Numbers>
+std::size_t plain_line_names(const char* block, std::size_t& begin, std::size_t end, std::span<std::string_view> names)
 {
+    const char* const block_end = block + end;
+    const char* start = block + begin;
+    std::size_t count = 0;
+    for (; count < names.size() && start < block_end; ++count) {
+        const char first = *start;
+        // A line end is white space too: an empty line is no plain one.
+        if (first == '#' || first == '+' || first == '-' || first == ':' || is_blank(first))
+            break;
+#if defined(__SSE2__)
+        // The block's slack is no line end, colon or digit: the look may reach into it.
+        const LineHead head = look_at_head(start);
+        const char* line_end = nullptr;
+        if (head.line_ends != 0) {
+            line_end = start + __builtin_ctz(head.line_ends);
+        } else if (const std::uint64_t rest = line_end_bits(start + 32)) {
+            line_end = start + 32 + __builtin_ctzll(rest);
+        } else {
+            line_end = find_line_end(start + 96, block_end);
+            if (!line_end)
+                break;
+        }
+        auto name_length = head_name_length<Numbers>(head);
+        if (!name_length)
+            name_length = walked_name_length(start, line_end, Numbers);
+#else
+        const char* const line_end = find_line_end(start, block_end);
+        if (!line_end)
+            break;
+        const auto name_length = walked_name_length(start, line_end, Numbers);
+#endif
+        if (!name_length)
+            break;
+        names[count] = std::string_view(start, *name_length);
+        start = line_end + 1;
+    }
+    begin = static_cast<std::size_t>(start - block);
+    return count;
+}
+
+} // namespace
+
+std::size_t AccountLineReader::plain_entry_names(std::span<std::string_view> names)
+{
+    if (m_kind == AccountFile::Passwd)
+        return plain_line_names<2>(m_block.get(), m_begin, m_end, names);
+    return plain_line_names<1>(m_block.get(), m_begin, m_end, names);
+}
+
+std::size_t AccountLineReader::next_names(std::string& scratch, std::span<std::string_view> names)
+{
+    std::size_t count = 0;
     for (;;) {
-        if (m_fd < 0 || (m_begin == m_end && !refill()))
-            return false;
-        if (plain_entry_name(name))
-            return true;
+        if (m_fd < 0)
+            return count;
+        // The names found so far point into the block: they go before it is read again.
+        if (m_begin == m_end && (count > 0 || !refill()))
+            return count;
+        if (!m_block_holds_nul) {
+            count += plain_entry_names(names.subspan(count));
+            if (count == names.size())
+                return count;
+            if (m_begin == m_end)
+                continue;
+        }
+        // A line that only the readers' own rules decide; reading it may read the block
+        // again, and its name may lie in `scratch`.
+        if (count > 0)
+            return count;
         const auto line = next();
         if (!line)
-            return false;
+            return 0;
         if (const auto entry = account_entry_name(*line, m_kind, scratch)) {
-            name = *entry;
-            return true;
+            names[0] = *entry;
+            return 1;
         }
     }
 }
