@@ -356,10 +356,10 @@ std::size_t AccountLineReader::plain_entry_names(std::span<std::string_view> nam
 
 std::size_t AccountLineReader::next_names(std::string& scratch, std::span<std::string_view> names)
 {
+    if (m_fd < 0)
+        return 0;
     std::size_t count = 0;
     for (;;) {
-        if (m_fd < 0)
-            return count;
         // The names found so far point into the block: they go before it is read again.
         if (m_begin == m_end && (count > 0 || !refill()))
             return count;
