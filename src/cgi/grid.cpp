@@ -30,18 +30,6 @@ FilteredPageCounter::FilteredPageCounter(long page, long rows_per_page)
 {
 }
 
-int FilteredPageCounter::offer(bool passes_filter)
-{
-    const bool in_range = m_first <= m_count && m_count < m_end;
-    if (!in_range) {
-        ++m_count;
-        return 0;
-    }
-    if (!passes_filter)
-        return 0;
-    return ++m_count;
-}
-
 ListPageRange::ListPageRange(long page, long rows_per_page)
     : m_first(saturated_product(saturated_previous(page), rows_per_page))
     , m_end(saturated_product(page, rows_per_page))
