@@ -347,13 +347,6 @@ std::size_t plain_line_names(const char* block, std::size_t& begin, std::size_t 
 
 } // namespace
 
-std::size_t AccountLineReader::plain_entry_names(std::span<std::string_view> names)
-{
-    if (m_kind == AccountFile::Passwd)
-        return plain_line_names<2>(m_block.get(), m_begin, m_end, names);
-    return plain_line_names<1>(m_block.get(), m_begin, m_end, names);
-}
-
 std::size_t AccountLineReader::next_names(std::string& scratch, std::span<std::string_view> names)
 {
     if (m_fd < 0)
@@ -364,7 +357,9 @@ std::size_t AccountLineReader::next_names(std::string& scratch, std::span<std::s
         if (m_begin == m_end && (count > 0 || !refill()))
             return count;
         if (!m_block_holds_nul) {
-            count += plain_entry_names(names.subspan(count));
+            const std::span<std::string_view> room = names.subspan(count);
+            count += m_kind == AccountFile::Passwd ? plain_line_names<2>(m_block.get(), m_begin, m_end, room)
+                                                   : plain_line_names<1>(m_block.get(), m_begin, m_end, room);
             if (count == names.size())
                 return count;
             if (m_begin == m_end)

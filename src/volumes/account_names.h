@@ -62,7 +62,6 @@ private:
     // Keeps the part of a piece of a long line that decides its entry, counting its
     // colons; true once the entry is decided.
     bool keep_head(const char* piece, std::size_t length, std::size_t& colons);
-    std::size_t plain_entry_names(std::span<std::string_view> names);
     int m_fd = -1;
     AccountFile m_kind;
     std::size_t m_colons;       // the colons up to the last field the entry depends on
