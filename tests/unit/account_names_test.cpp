@@ -57,6 +57,22 @@ std::string plain_lines()
     return text;
 }
 
+// Lines whose number fields end before, at and past the 32nd byte, well-formed or
+// spoilt right after the gid: names of 1 to 30 bytes push the fields across it.
+std::string lines_across_the_first_bytes()
+{
+    std::string text;
+    for (std::size_t length = 1; length <= 30; ++length) {
+        for (const std::size_t uid : {1, 5, 9, 10}) {
+            for (const std::size_t gid : {1, 5, 9, 10}) {
+                for (const char* rest : {"", ":/h:/s", "x:/h:/s", " :/h"})
+                    text += std::string(length, 'n') + ":x:" + std::string(uid, '1') + ":" + std::string(gid, '2') + rest + "\n";
+            }
+        }
+    }
+    return text;
+}
+
 } // namespace
 
 TEST(AccountNames, FindTheEntriesOfOddAndRandomLinesAsTheLibraryDoes)
@@ -83,6 +99,7 @@ TEST(AccountNames, FindTheEntriesOfOddAndRandomLinesAsTheLibraryDoes)
         {"NUL past a block", std::string(70000, 'n') + std::string(1, '\0') + ":x:1:1\nz:x:1:2\n"},
         {"long last line", "a:x:1:2\n" + std::string(100000, 'b')},
         {"plain lines of every length across block ends", plain_lines()},
+        {"number fields across the first bytes looked at together", lines_across_the_first_bytes()},
     };
     for (const auto& [what, content] : cases)
         expect_same_names(content, what);
