@@ -1,6 +1,8 @@
-// The config store's index against pugixml on any file content: whatever the index
-// takes, pugixml reads too, and every key of pugixml's document (and one below each)
-// has the same text, or is missing, in both.
+// The config store's document against pugixml on any file content, read as UTF-8 (the
+// store's files are; pugixml would otherwise guess from the first bytes): a file reads as a
+// document in both or in neither, and every key of it (and one below each) has the same
+// value, or is missing, in both; what the store writes reads back the same in both; a
+// value that is set reads back as it was set.
 #include <cstddef>
 #include <cstdint>
 #include <pugixml.hpp>
@@ -8,7 +10,7 @@
 #include <string_view>
 
 #include "fuzz_check.h"
-#include "sim/lib/config_index.h"
+#include "sim/lib/config_document.h"
 
 namespace {
 
@@ -29,23 +31,38 @@ pugi::xml_node find_key(const pugi::xml_document& doc, const std::string& path)
     return node;
 }
 
-void compare(const ConfigIndex& index, const pugi::xml_document& doc, const std::string& path)
+void compare(const ConfigDocument& document, const pugi::xml_document& doc, const std::string& path)
 {
-    const std::optional<std::string_view> value = index.value(path);
+    const std::optional<std::string_view> value = document.value(path);
     const pugi::xml_node key = find_key(doc, path);
     fuzz_check(value.has_value() == static_cast<bool>(key), "a key is found by both or by neither");
     if (value)
-        fuzz_check(*value == key.child_value(), "a key has the same text in both");
+        fuzz_check(*value == key.child_value(), "a key has the same value in both");
 }
 
-void compare_below(const ConfigIndex& index, const pugi::xml_document& doc, pugi::xml_node node, const std::string& path)
+void compare_below(const ConfigDocument& document, const pugi::xml_document& doc, pugi::xml_node node,
+                   const std::string& path)
 {
-    compare(index, doc, path);
-    compare(index, doc, path + "/missing");
+    compare(document, doc, path);
+    compare(document, doc, path + "/missing");
     for (pugi::xml_node child = node.first_child(); child; child = child.next_sibling()) {
         if (child.type() == pugi::node_element)
-            compare_below(index, doc, child, path + "/" + child.name());
+            compare_below(document, doc, child, path + "/" + child.name());
     }
+}
+
+pugi::xml_parse_result load(pugi::xml_document& doc, const std::string& text)
+{
+    return doc.load_buffer(text.data(), text.size(), pugi::parse_default, pugi::encoding_utf8);
+}
+
+// The document against pugixml's reading of `text`, which must be a document.
+void compare_with(const ConfigDocument& document, const std::string& text)
+{
+    pugi::xml_document doc;
+    fuzz_check(static_cast<bool>(load(doc, text)), "pugixml reads the text");
+    fuzz_check(static_cast<bool>(doc.document_element()), "the document has its root");
+    compare_below(document, doc, doc.document_element(), "");
 }
 
 } // namespace
@@ -53,12 +70,30 @@ void compare_below(const ConfigIndex& index, const pugi::xml_document& doc, pugi
 extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size)
 {
     const std::string text(reinterpret_cast<const char*>(data), size);
-    ConfigIndex index;
-    if (!index.index(text))
-        return 0;
+    ConfigDocument document;
     pugi::xml_document doc;
-    fuzz_check(static_cast<bool>(doc.load_buffer(text.data(), text.size())), "pugixml reads what the index takes");
-    fuzz_check(static_cast<bool>(doc.document_element()), "the document has its root");
-    compare_below(index, doc, doc.document_element(), "");
+    const bool read = document.parse(text);
+    const bool pugixml_read = load(doc, text) && doc.document_element();
+    fuzz_check(read == pugixml_read, "a file is a document to both or to neither");
+    if (!read)
+        document.reset("config");
+    else
+        compare_with(document, text);
+
+    const std::string written = document.text();
+    ConfigDocument again;
+    fuzz_check(again.parse(written), "the store reads what it writes");
+    compare_with(again, written);
+
+    // A value of any bytes but NUL, set below the root and read back through the file:
+    // a text of spaces, tabs and line ends only is no text, and reads back empty.
+    std::string value = text.substr(text.size() / 2);
+    std::erase(value, '\0');
+    document.set("/fuzz/key", value);
+    const std::string saved = document.text();
+    fuzz_check(again.parse(saved), "the store reads what it writes after a change");
+    const bool blank = value.find_first_not_of(" \t\n") == std::string::npos;
+    fuzz_check(again.value("/fuzz/key") == (blank ? "" : value), "a value reads back as it was set");
+    compare_with(again, saved);
     return 0;
 }
