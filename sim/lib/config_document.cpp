@@ -1,6 +1,8 @@
 #include "config_document.h"
 
+#include <algorithm>
 #include <cstdint>
+#include <span>
 #include <utility>
 
 namespace {
@@ -213,6 +215,7 @@ int ConfigDocument::add(Node node, int parent)
 bool ConfigDocument::parse(std::string source)
 {
     m_nodes.clear();
+    m_attributes.clear();
     m_kept.clear();
     std::string_view text = keep(std::move(source));
     // The file is text: it ends at a NUL.
@@ -224,10 +227,13 @@ bool ConfigDocument::parse(std::string source)
     };
     const auto fail = [this] {
         m_nodes.clear();
+        m_attributes.clear();
         m_kept.clear();
         return false;
     };
 
+    // A node for about every "<": an element has one or two, a text follows one.
+    m_nodes.reserve(static_cast<std::size_t>(std::count(text.begin(), text.end(), '<')) + 1);
     m_nodes.push_back({.kind = Kind::Document});
     int open = 0;   // the node whose content is being read
     std::size_t at = 0;
@@ -236,7 +242,7 @@ bool ConfigDocument::parse(std::string source)
         // A text outside the root element, and one of blanks only, is no part of the tree.
         const std::string_view chunk = text.substr(at, tag == kNone ? kNone : tag - at);
         if (open != 0 && !only_blanks(chunk))
-            add({.kind = Kind::Text, .value = piece(chunk, Content::Text)}, open);
+            add({.kind = Kind::Text, .text = piece(chunk, Content::Text)}, open);
         if (tag == kNone)
             break;
         at = tag + 1;
@@ -257,7 +263,7 @@ bool ConfigDocument::parse(std::string source)
             const std::size_t end = text.find("]]>", at + 8);
             if (end == kNone)
                 return fail();
-            add({.kind = Kind::Cdata, .value = piece(text.substr(at + 8, end - at - 8), Content::Cdata)}, open);
+            add({.kind = Kind::Cdata, .text = piece(text.substr(at + 8, end - at - 8), Content::Cdata)}, open);
             at = end + 3;
         } else if (rest.starts_with("!DOCTYPE") && open == 0) {
             // A document type, at the top: up to its ">", past its quoted strings,
@@ -294,13 +300,15 @@ bool ConfigDocument::parse(std::string source)
             ++at;
             const std::string_view name = read_name(text, at);
             skip_blanks(text, at);
-            if (open == 0 || name != m_nodes[static_cast<std::size_t>(open)].name || at == text.size() || text[at] != '>')
+            if (open == 0 || name != m_nodes[static_cast<std::size_t>(open)].text || at == text.size() || text[at] != '>')
                 return fail();
             open = m_nodes[static_cast<std::size_t>(open)].parent;
             ++at;
         } else {
-            Node element{.kind = Kind::Element, .name = read_name(text, at)};
-            if (element.name.empty())
+            Node element{.kind = Kind::Element,
+                         .first_attribute = static_cast<int>(m_attributes.size()),
+                         .text = read_name(text, at)};
+            if (element.text.empty())
                 return fail();
             // Attributes, each after a blank, up to ">" or "/>".
             for (;;) {
@@ -328,7 +336,8 @@ bool ConfigDocument::parse(std::string source)
                 if (end == kNone)
                     return fail();
                 attribute.value = piece(text.substr(at + 1, end - at - 1), Content::Attribute);
-                element.attributes.push_back(attribute);
+                m_attributes.push_back(attribute);
+                ++element.attribute_count;
                 at = end + 1;
             }
         }
@@ -341,9 +350,10 @@ bool ConfigDocument::parse(std::string source)
 void ConfigDocument::reset(std::string_view name)
 {
     m_nodes.clear();
+    m_attributes.clear();
     m_kept.clear();
     m_nodes.push_back({.kind = Kind::Document});
-    add({.kind = Kind::Element, .name = keep(std::string(name))}, 0);
+    add({.kind = Kind::Element, .text = keep(std::string(name))}, 0);
 }
 
 int ConfigDocument::root() const
@@ -356,7 +366,7 @@ int ConfigDocument::child_element(int node, std::string_view name) const
 {
     for (int child = m_nodes[static_cast<std::size_t>(node)].first_child; child >= 0;) {
         const Node& found = m_nodes[static_cast<std::size_t>(child)];
-        if (found.kind == Kind::Element && (name.empty() || found.name == name))
+        if (found.kind == Kind::Element && (name.empty() || found.text == name))
             return child;
         child = found.next_sibling;
     }
@@ -389,7 +399,7 @@ std::optional<std::string_view> ConfigDocument::value(std::string_view path) con
     if (node < 0)
         return std::nullopt;
     const int text = first_text(node);
-    const std::string_view value = text >= 0 ? m_nodes[static_cast<std::size_t>(text)].value : std::string_view("");
+    const std::string_view value = text >= 0 ? m_nodes[static_cast<std::size_t>(text)].text : std::string_view("");
     return value.substr(0, value.find('\0'));
 }
 
@@ -404,15 +414,16 @@ void ConfigDocument::set(std::string_view path, std::string_view value)
         const std::string_view name = path.substr(0, path.find('/'));
         path.remove_prefix(name.size());
         const int child = child_element(node, name);
-        node = child >= 0 ? child : add({.kind = Kind::Element, .name = keep(std::string(name))}, node);
+        node = child >= 0 ? child : add({.kind = Kind::Element, .text = keep(std::string(name))}, node);
     }
     // A CDATA section that takes the value becomes a text: a value may hold "]]>".
     const std::string_view kept = keep(std::string(value));
     if (const int text = first_text(node); text >= 0)
-        m_nodes[static_cast<std::size_t>(text)] = {.kind = Kind::Text, .value = kept, .parent = node,
-                                                   .next_sibling = m_nodes[static_cast<std::size_t>(text)].next_sibling};
+        m_nodes[static_cast<std::size_t>(text)] = {.kind = Kind::Text, .parent = node,
+                                                   .next_sibling = m_nodes[static_cast<std::size_t>(text)].next_sibling,
+                                                   .text = kept};
     else
-        add({.kind = Kind::Text, .value = kept}, node);
+        add({.kind = Kind::Text, .text = kept}, node);
 }
 
 std::string ConfigDocument::text() const
@@ -434,11 +445,11 @@ void ConfigDocument::write(std::string& out, int index, int depth, bool indented
     if (indented)
         out.append(static_cast<std::size_t>(depth), '\t');
     if (node.kind == Kind::Text) {
-        append_escaped(out, node.value, Content::Text);
+        append_escaped(out, node.text, Content::Text);
     } else if (node.kind == Kind::Cdata) {
         // "]]>" would end the section: it ends one and starts the next within it.
         out += "<![CDATA[";
-        std::string_view rest = node.value;
+        std::string_view rest = node.text;
         for (std::size_t end; (end = rest.find("]]>")) != kNone; rest.remove_prefix(end + 2)) {
             out += rest.substr(0, end + 2);
             out += "]]><![CDATA[";
@@ -447,8 +458,9 @@ void ConfigDocument::write(std::string& out, int index, int depth, bool indented
         out += "]]>";
     } else {
         out += '<';
-        out += node.name;
-        for (const Attribute& attribute : node.attributes) {
+        out += node.text;
+        const auto first = m_attributes.begin() + node.first_attribute;
+        for (const Attribute& attribute : std::span(first, first + node.attribute_count)) {
             out += ' ';
             out += attribute.name;
             out += "=\"";
@@ -465,7 +477,7 @@ void ConfigDocument::write(std::string& out, int index, int depth, bool indented
             if (lines)
                 out.append(static_cast<std::size_t>(depth), '\t');
             out += "</";
-            out += node.name;
+            out += node.text;
             out += '>';
         }
     }

@@ -52,13 +52,13 @@ private:
     };
     struct Node {
         Kind kind;
-        std::string_view name;      // of an element
-        std::string_view value;     // of a text or CDATA section
-        std::vector<Attribute> attributes;
         int parent = -1;
         int first_child = -1;
         int last_child = -1;
         int next_sibling = -1;
+        int first_attribute = 0;    // an element's attributes, in m_attributes
+        int attribute_count = 0;
+        std::string_view text;      // an element's name; a text's or CDATA section's value
     };
 
     int add(Node node, int parent);
@@ -72,5 +72,6 @@ private:
     void write(std::string& out, int node, int depth, bool indented) const;
 
     std::vector<Node> m_nodes;
+    std::vector<Attribute> m_attributes;
     std::forward_list<std::string> m_kept;
 };
