@@ -88,8 +88,9 @@ bool replace_file(const std::string& path, std::string_view content)
     if (!file.valid())
         return false;
     // Straight into the text, sized by the file's length and a byte more, so that the end
-    // shows without growing it; a file that grows meanwhile, or has no length (/proc),
-    // is read on.
+    // shows without growing it: a file with a length that gives less than was asked has
+    // ended, and no read is spent to hear so. A file that grows meanwhile, or has no
+    // length (/proc), is read on.
     struct stat status {};
     const bool sized = ::fstat(file.get(), &status) == 0 && status.st_size > 0;
     content.resize(sized ? static_cast<std::size_t>(status.st_size) + 1 : 4096);
@@ -97,13 +98,15 @@ bool replace_file(const std::string& path, std::string_view content)
     for (;;) {
         if (used == content.size())
             content.resize(2 * content.size());
-        const ssize_t n = ::read(file.get(), content.data() + used, content.size() - used);
+        const std::size_t asked = content.size() - used;
+        const ssize_t n = ::read(file.get(), content.data() + used, asked);
         if (n < 0 && errno == EINTR)
             continue;
-        if (n <= 0) {
+        if (n > 0)
+            used += static_cast<std::size_t>(n);
+        if (n <= 0 || (sized && static_cast<std::size_t>(n) < asked)) {
             content.resize(used);
-            return n == 0;
+            return n >= 0;
         }
-        used += static_cast<std::size_t>(n);
     }
 }
