@@ -431,56 +431,75 @@ std::string ConfigDocument::text() const
     std::string out = "<?xml version=\"1.0\"?>\n";
     if (m_nodes.empty())
         return out;
-    for (int child = m_nodes[0].first_child; child >= 0; child = m_nodes[static_cast<std::size_t>(child)].next_sibling)
-        write(out, child, 0, true);
+    // Whether each open element has its children on lines of their own, indented by
+    // their depth: an element with a text among its children has them all on its line,
+    // so that no indentation joins its texts, and so has one nested so deep that the
+    // indentation would outgrow the file. A stack of its own rather than calls: a file
+    // may nest deeper than calls can go.
+    constexpr std::size_t kDeepestIndented = 64;
+    std::vector<bool> lines{true};
+    for (int index = m_nodes[0].first_child; index >= 0;) {
+        const Node& node = m_nodes[static_cast<std::size_t>(index)];
+        const bool indented = lines.back();
+        if (indented)
+            out.append(lines.size() - 1, '\t');
+        if (node.kind == Kind::Element && node.first_child >= 0) {
+            write_start(out, node);
+            out += '>';
+            const bool children_on_lines = indented && first_text(index) < 0 && lines.size() < kDeepestIndented;
+            if (children_on_lines)
+                out += '\n';
+            lines.push_back(children_on_lines);
+            index = node.first_child;
+            continue;
+        }
+        if (node.kind == Kind::Element) {
+            write_start(out, node);
+            out += " />";
+        } else if (node.kind == Kind::Text) {
+            append_escaped(out, node.text, Content::Text);
+        } else {
+            // "]]>" would end the section: it ends one and starts the next within it.
+            out += "<![CDATA[";
+            std::string_view rest = node.text;
+            for (std::size_t end; (end = rest.find("]]>")) != kNone; rest.remove_prefix(end + 2)) {
+                out += rest.substr(0, end + 2);
+                out += "]]><![CDATA[";
+            }
+            out += rest;
+            out += "]]>";
+        }
+        if (indented)
+            out += '\n';
+        // On to the next node, ending each element whose last child was written.
+        while (m_nodes[static_cast<std::size_t>(index)].next_sibling < 0 && m_nodes[static_cast<std::size_t>(index)].parent > 0) {
+            index = m_nodes[static_cast<std::size_t>(index)].parent;
+            const bool children_on_lines = lines.back();
+            lines.pop_back();
+            if (children_on_lines)
+                out.append(lines.size() - 1, '\t');
+            out += "</";
+            out += m_nodes[static_cast<std::size_t>(index)].text;
+            out += '>';
+            if (lines.back())
+                out += '\n';
+        }
+        index = m_nodes[static_cast<std::size_t>(index)].next_sibling;
+    }
     return out;
 }
 
-// A node on its own line, indented by its depth, or within its parent's line. An
-// element with a text among its children has them all on its line, so that no
-// indentation joins its texts.
-void ConfigDocument::write(std::string& out, int index, int depth, bool indented) const
+// "<name" and the element's attributes.
+void ConfigDocument::write_start(std::string& out, const Node& element) const
 {
-    const Node& node = m_nodes[static_cast<std::size_t>(index)];
-    if (indented)
-        out.append(static_cast<std::size_t>(depth), '\t');
-    if (node.kind == Kind::Text) {
-        append_escaped(out, node.text, Content::Text);
-    } else if (node.kind == Kind::Cdata) {
-        // "]]>" would end the section: it ends one and starts the next within it.
-        out += "<![CDATA[";
-        std::string_view rest = node.text;
-        for (std::size_t end; (end = rest.find("]]>")) != kNone; rest.remove_prefix(end + 2)) {
-            out += rest.substr(0, end + 2);
-            out += "]]><![CDATA[";
-        }
-        out += rest;
-        out += "]]>";
-    } else {
-        out += '<';
-        out += node.text;
-        const auto first = m_attributes.begin() + node.first_attribute;
-        for (const Attribute& attribute : std::span(first, first + node.attribute_count)) {
-            out += ' ';
-            out += attribute.name;
-            out += "=\"";
-            append_escaped(out, attribute.value, Content::Attribute);
-            out += '"';
-        }
-        if (node.first_child < 0) {
-            out += " />";
-        } else {
-            const bool lines = indented && first_text(index) < 0;
-            out += lines ? ">\n" : ">";
-            for (int child = node.first_child; child >= 0; child = m_nodes[static_cast<std::size_t>(child)].next_sibling)
-                write(out, child, depth + 1, lines);
-            if (lines)
-                out.append(static_cast<std::size_t>(depth), '\t');
-            out += "</";
-            out += node.text;
-            out += '>';
-        }
+    out += '<';
+    out += element.text;
+    const auto first = m_attributes.begin() + element.first_attribute;
+    for (const Attribute& attribute : std::span(first, first + element.attribute_count)) {
+        out += ' ';
+        out += attribute.name;
+        out += "=\"";
+        append_escaped(out, attribute.value, Content::Attribute);
+        out += '"';
     }
-    if (indented)
-        out += '\n';
 }

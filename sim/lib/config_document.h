@@ -69,7 +69,7 @@ private:
     // values and new names. The list's nodes never move, so views into them stay valid
     // when the document is moved.
     std::string_view keep(std::string text);
-    void write(std::string& out, int node, int depth, bool indented) const;
+    void write_start(std::string& out, const Node& element) const;
 
     std::vector<Node> m_nodes;
     std::vector<Attribute> m_attributes;
