@@ -1,8 +1,8 @@
 // The config store's document against pugixml on any file content, read as UTF-8 (the
 // store's files are; pugixml would otherwise guess from the first bytes): a file reads as a
 // document in both or in neither, and every key of it (and one below each) has the same
-// value, or is missing, in both; what the store writes reads back the same in both; a
-// value that is set reads back as it was set.
+// value, or is missing, in both; what the store writes reads back the same in both, with
+// every key's value as it was; a value that is set reads back as it was set.
 #include <cstddef>
 #include <cstdint>
 #include <pugixml.hpp>
@@ -84,16 +84,23 @@ extern "C" int LLVMFuzzerTestOneInput(const std::uint8_t* data, std::size_t size
     ConfigDocument again;
     fuzz_check(again.parse(written), "the store reads what it writes");
     compare_with(again, written);
+    // Every key keeps its value through the store's writing: a save changes no key that
+    // it was not asked to.
+    if (read)
+        compare_below(again, doc, doc.document_element(), "");
 
-    // A value of any bytes but NUL, set below the root and read back through the file:
-    // a text of spaces, tabs and line ends only is no text, and reads back empty.
+    // A value of any bytes but NUL, set below the root and read back through the file;
+    // the first key of the file takes one too, in place of its text or CDATA section.
     std::string value = text.substr(text.size() / 2);
     std::erase(value, '\0');
-    document.set("/fuzz/key", value);
+    fuzz_check(document.set("/fuzz/key", value), "a key of names is set");
+    const char* first = read ? doc.document_element().first_child().name() : "";
+    const std::string first_key = *first ? std::string("/") + first : "";
+    fuzz_check(document.set(first_key, value), "a key of the file is set");
     const std::string saved = document.text();
     fuzz_check(again.parse(saved), "the store reads what it writes after a change");
-    const bool blank = value.find_first_not_of(" \t\n") == std::string::npos;
-    fuzz_check(again.value("/fuzz/key") == (blank ? "" : value), "a value reads back as it was set");
+    fuzz_check(again.value("/fuzz/key") == value, "a value reads back as it was set");
+    fuzz_check(again.value(first_key) == value, "a value set in place reads back as it was set");
     compare_with(again, saved);
     return 0;
 }

@@ -165,11 +165,15 @@ bool reads_as_itself(std::string_view raw, Content content)
 
 // A text or attribute as the file holds it: what would read as something else is
 // written as a reference. A control character other than a tab or line end of a text
-// is one too, so that the value reads back as it was.
+// is one too, and so is the first character of a text of blanks only, which would not
+// be read as a text at all: the value reads back as it was.
 void append_escaped(std::string& out, std::string_view value, Content content)
 {
-    for (const char c : value) {
+    const bool blank = content == Content::Text && !value.empty() && value.find_first_not_of(" \t\n") == kNone;
+    for (std::size_t at = 0; at < value.size(); ++at) {
+        const char c = value[at];
         const auto code = static_cast<unsigned char>(c);
+        const bool first = at == 0;
         if (c == '&')
             out += "&amp;";
         else if (c == '<')
@@ -178,7 +182,7 @@ void append_escaped(std::string& out, std::string_view value, Content content)
             out += "&gt;";
         else if (c == '"' && content == Content::Attribute)
             out += "&quot;";
-        else if (code < 0x20 && (content == Content::Attribute || (c != '\t' && c != '\n'))) {
+        else if ((code < 0x20 && (content == Content::Attribute || (c != '\t' && c != '\n'))) || (blank && first)) {
             out += "&#";
             out += static_cast<char>('0' + code / 10);
             out += static_cast<char>('0' + code % 10);
@@ -232,8 +236,10 @@ bool ConfigDocument::parse(std::string source)
         return false;
     };
 
-    // A node for about every "<": an element has one or two, a text follows one.
-    m_nodes.reserve(static_cast<std::size_t>(std::count(text.begin(), text.end(), '<')) + 1);
+    // A node for about every "<" (an element has one or two, a text follows one), as
+    // far as a config file's few hundred; a larger file grows the room as it goes.
+    const auto tags = static_cast<std::size_t>(std::count(text.begin(), text.end(), '<'));
+    m_nodes.reserve(std::min<std::size_t>(tags + 1, 1024));
     m_nodes.push_back({.kind = Kind::Document});
     int open = 0;   // the node whose content is being read
     std::size_t at = 0;
@@ -267,7 +273,8 @@ bool ConfigDocument::parse(std::string source)
             at = end + 3;
         } else if (rest.starts_with("!DOCTYPE") && open == 0) {
             // A document type, at the top: up to its ">", past its quoted strings,
-            // comments, processing instructions and the declarations within it.
+            // comments, processing instructions, conditional sections (up to their
+            // "]]>", nested ones too) and the declarations within it.
             at += 8;
             int depth = 0;
             for (;;) {
@@ -276,6 +283,17 @@ bool ConfigDocument::parse(std::string source)
                 if (inside.starts_with("<!--")) {
                     end = text.find("-->", at + 4);
                     at = end + 3;
+                } else if (inside.starts_with("<![")) {
+                    at += 3;
+                    for (int sections = 1; sections > 0 && at < text.size();) {
+                        const std::string_view section = text.substr(at);
+                        sections += section.starts_with("<![") ? 1 : section.starts_with("]]>") ? -1 : 0;
+                        at += section.starts_with("<![") || section.starts_with("]]>") ? 3 : 1;
+                        if (sections == 0)
+                            end = at;
+                    }
+                } else if (inside.starts_with("<!-")) {
+                    return fail();
                 } else if (inside.starts_with("<?")) {
                     end = text.find("?>", at + 2);
                     at = end + 2;
@@ -349,11 +367,12 @@ bool ConfigDocument::parse(std::string source)
 
 void ConfigDocument::reset(std::string_view name)
 {
+    std::string root(name);
     m_nodes.clear();
     m_attributes.clear();
     m_kept.clear();
     m_nodes.push_back({.kind = Kind::Document});
-    add({.kind = Kind::Element, .text = keep(std::string(name))}, 0);
+    add({.kind = Kind::Element, .text = keep(std::move(root))}, 0);
 }
 
 int ConfigDocument::root() const
@@ -403,8 +422,16 @@ std::optional<std::string_view> ConfigDocument::value(std::string_view path) con
     return value.substr(0, value.find('\0'));
 }
 
-void ConfigDocument::set(std::string_view path, std::string_view value)
+bool ConfigDocument::set(std::string_view path, std::string_view value)
 {
+    // Every name of the path must be one that the file can hold.
+    for (std::string_view rest = path; !rest.empty();) {
+        const std::string_view name = rest.substr(0, rest.find('/'));
+        std::size_t end = 0;
+        if (!name.empty() && read_name(name, end).size() != name.size())
+            return false;
+        rest.remove_prefix(std::min(rest.size(), name.size() + 1));
+    }
     int node = root();
     while (!path.empty()) {
         if (path.front() == '/') {
@@ -424,6 +451,7 @@ void ConfigDocument::set(std::string_view path, std::string_view value)
                                                    .text = kept};
     else
         add({.kind = Kind::Text, .text = kept}, node);
+    return true;
 }
 
 std::string ConfigDocument::text() const
@@ -458,6 +486,9 @@ std::string ConfigDocument::text() const
             out += " />";
         } else if (node.kind == Kind::Text) {
             append_escaped(out, node.text, Content::Text);
+            // Two texts in a row would read back as one.
+            if (node.next_sibling >= 0 && m_nodes[static_cast<std::size_t>(node.next_sibling)].kind == Kind::Text)
+                out += "<!---->";
         } else {
             // "]]>" would end the section: it ends one and starts the next within it.
             out += "<![CDATA[";

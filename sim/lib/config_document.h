@@ -38,8 +38,9 @@ public:
     std::optional<std::string_view> value(std::string_view path) const;
     // Gives the element at the path, made with what is missing of it, the value: its
     // first text or CDATA section becomes the value, or a text is added last. The tree
-    // has a root element.
-    void set(std::string_view path, std::string_view value);
+    // has a root element. False, and nothing changed, when a name of the path is not
+    // one an element can have.
+    bool set(std::string_view path, std::string_view value);
 
     // The document as the store writes it.
     std::string text() const;

@@ -11,37 +11,52 @@
 #include "platform/config_store.h"
 
 #include <algorithm>
+#include <cerrno>
 #include <climits>
 #include <optional>
 #include <string>
 #include <string_view>
 #include <utility>
+#include <unistd.h>
 #include <vector>
 
 #include "cgi/atomic_file.h"
 #include "cgi/file_lock.h"
 #include "config_document.h"
 #include "journal.h"
-#include "text_file.h"
 
 namespace {
 
 constexpr const char* kConfigFile = "/etc/NAS_CFG/config.xml";
 
-// The file's document; a file that is missing or is no document reads as an empty
-// store, whose changes are saved into a new one.
-ConfigDocument read_document(const char* file)
+// The file's document: an empty store when there is no file, nothing when the file is
+// there but cannot be read or is no document.
+std::optional<ConfigDocument> read_document(const char* file)
 {
     ConfigDocument document;
-    if (!document.parse(read_text(file)))
+    std::string text;
+    if (!read_whole_file(file, text)) {
+        if (::access(file, F_OK) == 0 || errno != ENOENT)
+            return std::nullopt;
         document.reset("config");
+    } else if (!document.parse(std::move(text))) {
+        return std::nullopt;
+    }
     return document;
 }
 
-// The store as this process read it first, and changed it since.
+// The store as this process read it first, and changed it since; a file it cannot
+// read serves as an empty store.
 ConfigDocument& document()
 {
-    static ConfigDocument store = read_document(kConfigFile);
+    static ConfigDocument store = [] {
+        std::optional<ConfigDocument> read = read_document(kConfigFile);
+        if (read)
+            return std::move(*read);
+        ConfigDocument empty;
+        empty.reset("config");
+        return empty;
+    }();
     return store;
 }
 
@@ -99,7 +114,8 @@ extern "C" int xml_get_int(const char* path)
 extern "C" int xml_set_str(const char* path, const char* value)
 {
     journal_record("xml_set_str", {path, value});
-    document().set(path, value);
+    if (!document().set(path, value))
+        return -1;
     changes().emplace_back(path, value);
     return 0;
 }
@@ -110,12 +126,16 @@ extern "C" int xml_write_file(const char* file)
     const auto lock = FileLock::acquire("config");
     if (!lock)
         return -1;
-    ConfigDocument current = read_document(file);
-    for (const auto& [path, value] : changes())
-        current.set(path, value);
-    if (!replace_file(file, current.text()))
+    // A file that is there but cannot be read, or is no document, is not replaced by
+    // this process's changes alone: the save fails, and the changes stay for the next.
+    std::optional<ConfigDocument> current = read_document(file);
+    if (!current)
         return -1;
-    document() = std::move(current);
+    for (const auto& [path, value] : changes())
+        current->set(path, value);
+    if (!replace_file(file, current->text()))
+        return -1;
+    document() = std::move(*current);
     changes().clear();
     return 0;
 }
