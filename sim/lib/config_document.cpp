@@ -193,6 +193,51 @@ void append_escaped(std::string& out, std::string_view value, Content content)
     }
 }
 
+// Past a document type, from after its "<!DOCTYPE" to after its ">": past its quoted
+// strings, comments, processing instructions, conditional sections (up to their "]]>",
+// nested ones too) and the declarations within it. False when it does not end so.
+bool skip_document_type(std::string_view text, std::size_t& at)
+{
+    int depth = 0;
+    for (;;) {
+        const std::string_view inside = text.substr(at);
+        std::size_t end = kNone;
+        if (inside.starts_with("<!--")) {
+            end = text.find("-->", at + 4);
+            at = end + 3;
+        } else if (inside.starts_with("<![")) {
+            at += 3;
+            for (int sections = 1; sections > 0 && at < text.size();) {
+                const std::string_view section = text.substr(at);
+                sections += section.starts_with("<![") ? 1 : section.starts_with("]]>") ? -1 : 0;
+                at += section.starts_with("<![") || section.starts_with("]]>") ? 3 : 1;
+                if (sections == 0)
+                    end = at;
+            }
+        } else if (inside.starts_with("<!-")) {
+            return false;
+        } else if (inside.starts_with("<?")) {
+            end = text.find("?>", at + 2);
+            at = end + 2;
+        } else if (inside.starts_with("<!")) {
+            ++depth;
+            end = at += 2;
+        } else if (inside.starts_with('"') || inside.starts_with('\'')) {
+            end = text.find(inside.front(), at + 1);
+            at = end + 1;
+        } else if (inside.starts_with('>')) {
+            ++at;
+            if (depth-- == 0)
+                return true;
+            end = at;
+        } else if (!inside.empty() && inside.front() != '<') {
+            end = ++at;
+        }
+        if (end == kNone)
+            return false;
+    }
+}
+
 } // namespace
 
 std::string_view ConfigDocument::keep(std::string text)
@@ -272,48 +317,9 @@ bool ConfigDocument::parse(std::string source)
             add({.kind = Kind::Cdata, .text = piece(text.substr(at + 8, end - at - 8), Content::Cdata)}, open);
             at = end + 3;
         } else if (rest.starts_with("!DOCTYPE") && open == 0) {
-            // A document type, at the top: up to its ">", past its quoted strings,
-            // comments, processing instructions, conditional sections (up to their
-            // "]]>", nested ones too) and the declarations within it.
             at += 8;
-            int depth = 0;
-            for (;;) {
-                const std::string_view inside = text.substr(at);
-                std::size_t end = kNone;
-                if (inside.starts_with("<!--")) {
-                    end = text.find("-->", at + 4);
-                    at = end + 3;
-                } else if (inside.starts_with("<![")) {
-                    at += 3;
-                    for (int sections = 1; sections > 0 && at < text.size();) {
-                        const std::string_view section = text.substr(at);
-                        sections += section.starts_with("<![") ? 1 : section.starts_with("]]>") ? -1 : 0;
-                        at += section.starts_with("<![") || section.starts_with("]]>") ? 3 : 1;
-                        if (sections == 0)
-                            end = at;
-                    }
-                } else if (inside.starts_with("<!-")) {
-                    return fail();
-                } else if (inside.starts_with("<?")) {
-                    end = text.find("?>", at + 2);
-                    at = end + 2;
-                } else if (inside.starts_with("<!")) {
-                    ++depth;
-                    end = at += 2;
-                } else if (inside.starts_with('"') || inside.starts_with('\'')) {
-                    end = text.find(inside.front(), at + 1);
-                    at = end + 1;
-                } else if (inside.starts_with('>')) {
-                    ++at;
-                    if (depth-- == 0)
-                        break;
-                    end = at;
-                } else if (!inside.empty() && inside.front() != '<') {
-                    end = ++at;
-                }
-                if (end == kNone)
-                    return fail();
-            }
+            if (!skip_document_type(text, at))
+                return fail();
         } else if (rest.starts_with('/')) {
             ++at;
             const std::string_view name = read_name(text, at);
