@@ -54,6 +54,17 @@ bool skip_blanks(std::string_view text, std::size_t& at)
     return at > start;
 }
 
+// The next name of a slash path ("/system_mgr/nfs/enable"), taken off it; empty at the
+// path's end. Empty components are skipped.
+std::string_view next_name(std::string_view& path)
+{
+    while (path.starts_with('/'))
+        path.remove_prefix(1);
+    const std::string_view name = path.substr(0, path.find('/'));
+    path.remove_prefix(name.size());
+    return name;
+}
+
 int digit_value(char c, bool hex)
 {
     if (c >= '0' && c <= '9')
@@ -251,9 +262,9 @@ int ConfigDocument::add(Node node, int parent)
     node.parent = parent;
     m_nodes.push_back(std::move(node));
     if (parent >= 0) {
-        Node& above = m_nodes[static_cast<std::size_t>(parent)];
+        Node& above = node_at(parent);
         if (above.last_child >= 0)
-            m_nodes[static_cast<std::size_t>(above.last_child)].next_sibling = added;
+            node_at(above.last_child).next_sibling = added;
         else
             above.first_child = added;
         above.last_child = added;
@@ -261,11 +272,16 @@ int ConfigDocument::add(Node node, int parent)
     return added;
 }
 
-bool ConfigDocument::parse(std::string source)
+void ConfigDocument::clear()
 {
     m_nodes.clear();
     m_attributes.clear();
     m_kept.clear();
+}
+
+bool ConfigDocument::parse(std::string source)
+{
+    clear();
     std::string_view text = keep(std::move(source));
     // The file is text: it ends at a NUL.
     text = text.substr(0, text.find('\0'));
@@ -275,9 +291,7 @@ bool ConfigDocument::parse(std::string source)
         return reads_as_itself(raw, content) ? raw : keep(decode(raw, content));
     };
     const auto fail = [this] {
-        m_nodes.clear();
-        m_attributes.clear();
-        m_kept.clear();
+        clear();
         return false;
     };
 
@@ -324,9 +338,9 @@ bool ConfigDocument::parse(std::string source)
             ++at;
             const std::string_view name = read_name(text, at);
             skip_blanks(text, at);
-            if (open == 0 || name != m_nodes[static_cast<std::size_t>(open)].text || at == text.size() || text[at] != '>')
+            if (open == 0 || name != node_at(open).text || at == text.size() || text[at] != '>')
                 return fail();
-            open = m_nodes[static_cast<std::size_t>(open)].parent;
+            open = node_at(open).parent;
             ++at;
         } else {
             Node element{.kind = Kind::Element,
@@ -374,9 +388,7 @@ bool ConfigDocument::parse(std::string source)
 void ConfigDocument::reset(std::string_view name)
 {
     std::string root(name);
-    m_nodes.clear();
-    m_attributes.clear();
-    m_kept.clear();
+    clear();
     m_nodes.push_back({.kind = Kind::Document});
     add({.kind = Kind::Element, .text = keep(std::move(root))}, 0);
 }
@@ -389,8 +401,8 @@ int ConfigDocument::root() const
 // The first element below `node` with the name, or with any name when `name` is empty.
 int ConfigDocument::child_element(int node, std::string_view name) const
 {
-    for (int child = m_nodes[static_cast<std::size_t>(node)].first_child; child >= 0;) {
-        const Node& found = m_nodes[static_cast<std::size_t>(child)];
+    for (int child = node_at(node).first_child; child >= 0;) {
+        const Node& found = node_at(child);
         if (found.kind == Kind::Element && (name.empty() || found.text == name))
             return child;
         child = found.next_sibling;
@@ -400,8 +412,8 @@ int ConfigDocument::child_element(int node, std::string_view name) const
 
 int ConfigDocument::first_text(int node) const
 {
-    for (int child = m_nodes[static_cast<std::size_t>(node)].first_child; child >= 0;) {
-        const Node& found = m_nodes[static_cast<std::size_t>(child)];
+    for (int child = node_at(node).first_child; child >= 0;) {
+        const Node& found = node_at(child);
         if (found.kind == Kind::Text || found.kind == Kind::Cdata)
             return child;
         child = found.next_sibling;
@@ -412,48 +424,33 @@ int ConfigDocument::first_text(int node) const
 std::optional<std::string_view> ConfigDocument::value(std::string_view path) const
 {
     int node = root();
-    while (!path.empty() && node >= 0) {
-        if (path.front() == '/') {
-            path.remove_prefix(1);
-            continue;
-        }
-        const std::string_view name = path.substr(0, path.find('/'));
-        path.remove_prefix(name.size());
+    for (std::string_view name; node >= 0 && !(name = next_name(path)).empty();)
         node = child_element(node, name);
-    }
     if (node < 0)
         return std::nullopt;
     const int text = first_text(node);
-    const std::string_view value = text >= 0 ? m_nodes[static_cast<std::size_t>(text)].text : std::string_view("");
+    const std::string_view value = text >= 0 ? node_at(text).text : std::string_view("");
     return value.substr(0, value.find('\0'));
 }
 
 bool ConfigDocument::set(std::string_view path, std::string_view value)
 {
     // Every name of the path must be one that the file can hold.
-    for (std::string_view rest = path; !rest.empty();) {
-        const std::string_view name = rest.substr(0, rest.find('/'));
+    for (std::string_view rest = path, name; !(name = next_name(rest)).empty();) {
         std::size_t end = 0;
-        if (!name.empty() && read_name(name, end).size() != name.size())
+        if (read_name(name, end).size() != name.size())
             return false;
-        rest.remove_prefix(std::min(rest.size(), name.size() + 1));
     }
     int node = root();
-    while (!path.empty()) {
-        if (path.front() == '/') {
-            path.remove_prefix(1);
-            continue;
-        }
-        const std::string_view name = path.substr(0, path.find('/'));
-        path.remove_prefix(name.size());
+    for (std::string_view name; !(name = next_name(path)).empty();) {
         const int child = child_element(node, name);
         node = child >= 0 ? child : add({.kind = Kind::Element, .text = keep(std::string(name))}, node);
     }
     // A CDATA section that takes the value becomes a text: a value may hold "]]>".
     const std::string_view kept = keep(std::string(value));
     if (const int text = first_text(node); text >= 0)
-        m_nodes[static_cast<std::size_t>(text)] = {.kind = Kind::Text, .parent = node,
-                                                   .next_sibling = m_nodes[static_cast<std::size_t>(text)].next_sibling,
+        node_at(text) = {.kind = Kind::Text, .parent = node,
+                                                   .next_sibling = node_at(text).next_sibling,
                                                    .text = kept};
     else
         add({.kind = Kind::Text, .text = kept}, node);
@@ -472,8 +469,8 @@ std::string ConfigDocument::text() const
     // may nest deeper than calls can go.
     constexpr std::size_t kDeepestIndented = 64;
     std::vector<bool> lines{true};
-    for (int index = m_nodes[0].first_child; index >= 0;) {
-        const Node& node = m_nodes[static_cast<std::size_t>(index)];
+    for (int index = node_at(0).first_child; index >= 0;) {
+        const Node& node = node_at(index);
         const bool indented = lines.back();
         if (indented)
             out.append(lines.size() - 1, '\t');
@@ -493,7 +490,7 @@ std::string ConfigDocument::text() const
         } else if (node.kind == Kind::Text) {
             append_escaped(out, node.text, Content::Text);
             // Two texts in a row would read back as one.
-            if (node.next_sibling >= 0 && m_nodes[static_cast<std::size_t>(node.next_sibling)].kind == Kind::Text)
+            if (node.next_sibling >= 0 && node_at(node.next_sibling).kind == Kind::Text)
                 out += "<!---->";
         } else {
             // "]]>" would end the section: it ends one and starts the next within it.
@@ -509,19 +506,19 @@ std::string ConfigDocument::text() const
         if (indented)
             out += '\n';
         // On to the next node, ending each element whose last child was written.
-        while (m_nodes[static_cast<std::size_t>(index)].next_sibling < 0 && m_nodes[static_cast<std::size_t>(index)].parent > 0) {
-            index = m_nodes[static_cast<std::size_t>(index)].parent;
+        while (node_at(index).next_sibling < 0 && node_at(index).parent > 0) {
+            index = node_at(index).parent;
             const bool children_on_lines = lines.back();
             lines.pop_back();
             if (children_on_lines)
                 out.append(lines.size() - 1, '\t');
             out += "</";
-            out += m_nodes[static_cast<std::size_t>(index)].text;
+            out += node_at(index).text;
             out += '>';
             if (lines.back())
                 out += '\n';
         }
-        index = m_nodes[static_cast<std::size_t>(index)].next_sibling;
+        index = node_at(index).next_sibling;
     }
     return out;
 }

@@ -62,6 +62,9 @@ private:
         std::string_view text;      // an element's name; a text's or CDATA section's value
     };
 
+    Node& node_at(int index) { return m_nodes[static_cast<std::size_t>(index)]; }
+    const Node& node_at(int index) const { return m_nodes[static_cast<std::size_t>(index)]; }
+    void clear();
     int add(Node node, int parent);
     int root() const;
     int child_element(int node, std::string_view name) const;
